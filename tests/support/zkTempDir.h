@@ -1,0 +1,55 @@
+// Test helpers: a temporary directory that removes itself, and whole-file
+// reads and writes for comparing exact bytes.
+#ifndef ZK_TESTS_TEMP_DIR_H
+#define ZK_TESTS_TEMP_DIR_H
+
+#include <ftw.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <unistd.h>
+
+#include <fstream>
+#include <iterator>
+#include <sstream>
+#include <string>
+
+class zkTempDir {
+public:
+    zkTempDir() {
+        const char* base = getenv("TMPDIR");
+        std::string pattern = std::string(base && *base ? base : "/tmp") + "/zkutil-test-XXXXXX";
+        if (mkdtemp(&pattern[0]) != nullptr) m_path = pattern;
+    }
+    ~zkTempDir() {
+        if (!m_path.empty()) nftw(m_path.c_str(), removeEntry, 16, FTW_DEPTH | FTW_PHYS);
+    }
+    zkTempDir(const zkTempDir&) = delete;
+    zkTempDir& operator=(const zkTempDir&) = delete;
+
+    // The directory, without a trailing slash; empty if it could not be made.
+    const std::string& path() const { return m_path; }
+    // The path of `name` inside the directory.
+    std::string file(const std::string& name) const { return m_path + "/" + name; }
+
+private:
+    static int removeEntry(const char* path, const struct stat*, int, struct FTW*) {
+        ::remove(path);
+        return 0;
+    }
+    std::string m_path;
+};
+
+// The whole content of a file, or "" when it cannot be read.
+inline std::string zkReadFile(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
+
+// Replaces a file's content with `bytes`; true when written.
+inline bool zkWriteFile(const std::string& path, const std::string& bytes) {
+    std::ofstream out(path, std::ios::binary | std::ios::trunc);
+    out << bytes;
+    return static_cast<bool>(out.flush());
+}
+
+#endif
