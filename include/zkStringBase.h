@@ -275,6 +275,9 @@ private:
     void spliceIn(unsigned pos, const char* s, unsigned n);
     // Replaces the text with n bytes of s (which may overlap the buffer).
     void assignBytes(const char* s, unsigned n);
+    // The field cutter behind both subString forms, with `count` separator bytes.
+    unsigned cutField(const char* seps, unsigned count, zkStringBase& out, unsigned from, unsigned to,
+                      int clearOnFail) const;
 };
 
 inline zkStringBase::StripType operator|(zkStringBase::StripType a, zkStringBase::StripType b) {

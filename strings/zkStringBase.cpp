@@ -142,6 +142,8 @@ void zkStringBase::makeNull() {
 
 void zkStringBase::spliceIn(unsigned pos, const char* s, unsigned n) {
     if (n == 0) return;
+    // The limit is tested before anything is read from s.
+    if (static_cast<unsigned long long>(m_length) + n + 1 > kMaxCapacity) throw std::bad_alloc();
     std::string copy;
     if (pointsInto(s, m_data, m_capacity)) {
         // The source is part of this string: moving the text or replacing the

@@ -254,36 +254,29 @@ zkStringBase zkStringBase::subString(unsigned from, unsigned to) const {
 }
 
 unsigned zkStringBase::subString(char sep, zkStringBase& out, unsigned from, unsigned to, int clearOnFail) const {
-    unsigned last = to >= m_length ? m_length - 1 : to;
-    if (m_length == 0 || from == BadIndex || from > last) {
-        if (clearOnFail) out.makeNull();
-        return BadIndex;
-    }
-    const char* hit = firstOfSet(m_data + from, m_data + last + 1, &sep, 1);
-    if (hit) {
-        unsigned at = static_cast<unsigned>(hit - m_data);
-        out.spliceIn(out.m_length, m_data + from, at - from);
-        return at;
-    }
-    out.spliceIn(out.m_length, m_data + from, last - from + 1);
-    if (clearOnFail) out.makeNull();
-    return BadIndex;
+    return cutField(&sep, 1, out, from, to, clearOnFail);
 }
 
 unsigned zkStringBase::subString(const zkStringBase& seps, zkStringBase& out, unsigned from, unsigned to,
                                  int clearOnFail) const {
+    return cutField(seps.m_data, seps.m_length, out, from, to, clearOnFail);
+}
+
+unsigned zkStringBase::cutField(const char* seps, unsigned count, zkStringBase& out, unsigned from, unsigned to,
+                                int clearOnFail) const {
     unsigned last = to >= m_length ? m_length - 1 : to;
     if (m_length == 0 || from == BadIndex || from > last) {
         if (clearOnFail) out.makeNull();
         return BadIndex;
     }
-    const char* hit = seps.m_length ? firstOfSet(m_data + from, m_data + last + 1, seps.m_data, seps.m_length)
-                                    : nullptr;
+    const char* hit = count ? firstOfSet(m_data + from, m_data + last + 1, seps, count) : nullptr;
     if (hit) {
         unsigned at = static_cast<unsigned>(hit - m_data);
         out.spliceIn(out.m_length, m_data + from, at - from);
         return at;
     }
+    // No separator: the field runs to the end of the range, and is kept only
+    // when the caller asked for that.
     out.spliceIn(out.m_length, m_data + from, last - from + 1);
     if (clearOnFail) out.makeNull();
     return BadIndex;
