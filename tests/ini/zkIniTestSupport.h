@@ -1,0 +1,41 @@
+// Helpers for the INI tests: a document as readable text, and loading given bytes.
+#ifndef ZK_TESTS_INI_TEST_SUPPORT_H
+#define ZK_TESTS_INI_TEST_SUPPORT_H
+
+#include <string>
+
+#include "support/zkTempDir.h"
+#include "zkMappedINIFile.h"
+
+inline std::string zkText(const zkStringBase& s) {
+    return std::string(s.data(), s.length());
+}
+
+inline zkStringBase zkStr(const char* text) {
+    return zkStringBase(text);
+}
+
+// "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
+inline std::string zkDump(zkMappedINIFile& ini) {
+    std::string out;
+    for (const INISection* section : *ini.GetSectionList()) {
+        out += "[" + zkText(section->m_name) + "]\n";
+        for (const INILine* line : *section->m_lines)
+            out += line->m_isComment ? "c:" + zkText(line->m_value) + "\n"
+                                     : "k:" + zkText(line->m_key) + "|" + zkText(line->m_value) + "\n";
+    }
+    return out;
+}
+
+// Writes bytes to the file `name` of dir, names it in ini and opens it.
+inline int zkLoad(zkMappedINIFile& ini, const zkTempDir& dir, const std::string& name, const std::string& bytes) {
+    if (!zkWriteFile(dir.file(name), bytes)) return -1;
+    ini.SetFilename(dir.file(name).c_str());
+    return ini.Open(0);
+}
+
+inline std::string zkTestData(const std::string& name) {
+    return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name);
+}
+
+#endif
