@@ -7,7 +7,8 @@
 // Every operation works on its arguments alone; m_slash is the one value
 // shared by all threads, so change it only while no other thread uses the
 // class. Nothing here prints or throws, except std::bad_alloc from a string
-// that cannot grow.
+// that cannot grow; a list node that cannot be allocated ends the process
+// with "out of memory", as all the library's containers do.
 #ifndef ZK_FILE_MANAGER_H
 #define ZK_FILE_MANAGER_H
 
@@ -55,10 +56,10 @@ public:
     // One file: a missing source, or one that is neither a directory nor a
     // regular file, gives 1. A directory source copies its own entries, as
     // with the pattern dir/*, whether or not its path ends in '/'. With
-    // makeDir exactly 1, destination's directory part is made first. An
-    // "ftp" or "http" source gives 1. With symLink nonzero a symbolic link
-    // to source's path is made at destination's path instead: 0 when made, 1
-    // when not. A '*' or '?' in destination's name part is replaced by
+    // makeDir exactly 1, destination's directory part (if any) is made
+    // first. An "ftp" or "http" source gives 1. With symLink nonzero a
+    // symbolic link to source's path is made at destination's path instead:
+    // 0 when made, 1 when not. A '*' or '?' in destination's name part is replaced by
     // source's name part (*.bak with a.txt gives a.bak), and an empty name
     // part takes source's name and extension (dir/ gives dir/a.txt). A
     // destination that names source itself, by the same path ignoring case

@@ -1,0 +1,257 @@
+#include "zkFileManager.h"
+
+#include <errno.h>
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+namespace {
+
+// The fallback copy moves data through one stack buffer of this size.
+constexpr unsigned kBlockSize = 16384;
+// The most one copy_file_range call is asked for; it fits a 32-bit size_t.
+constexpr unsigned long long kKernelChunk = 1ull << 30;
+// The first buffer for a symbolic link's target; it doubles until the target fits.
+constexpr size_t kFirstLinkBuffer = 256;
+// GetFileSize hands back the high 32 bits of a size separately.
+constexpr int kHighShift = 32;
+
+constexpr unsigned kReadAccess = 0444;
+constexpr unsigned kWriteAccess = 0222;
+constexpr unsigned kCreatedMode = 0664;
+
+constexpr char kSeparator = '/';
+constexpr const char* kAllEntries = "*";
+
+struct Options {
+    unsigned recursive;
+    unsigned makeDir;
+    unsigned overwrite;
+    unsigned symLink;
+    unsigned deleteSource;
+};
+
+// The directory that the outermost directory copy fills. Entries that are
+// this directory are skipped, so a destination inside the source tree is
+// never copied into itself.
+struct Root {
+    bool known = false;
+    dev_t dev = 0;
+    ino_t ino = 0;
+};
+
+int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, Root& root);
+
+bool hasWildcard(const char* path) {
+    return std::strpbrk(path, "*?") != nullptr;
+}
+
+bool sameFile(const struct stat& a, const struct stat& b) {
+    return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
+std::string asDirectory(const char* path) {
+    std::string dir(path);
+    if (dir.empty() || dir.back() != kSeparator) dir += kSeparator;
+    return dir;
+}
+
+// Moves what copy_file_range or, where the kernel refuses it (another file
+// system, an old kernel, an emulator), read and write can move: at most
+// remaining bytes. The number moved, 0 when the source has ended, or -1 on
+// an error.
+long long moveSome(int in, int out, unsigned long long remaining, bool& kernelCopy) {
+    while (kernelCopy) {
+        size_t chunk = static_cast<size_t>(remaining < kKernelChunk ? remaining : kKernelChunk);
+        ssize_t n = copy_file_range(in, nullptr, out, nullptr, chunk, 0);
+        if (n > 0) return n;
+        if (n < 0 && errno == EINTR) continue;
+        // Nothing was moved, so the block loop takes over from the same
+        // positions. A real error shows there again, and so does a real end
+        // of the source: some file systems report an end to copy_file_range
+        // while read still delivers data.
+        kernelCopy = false;
+    }
+    char buffer[kBlockSize];
+    unsigned wanted = remaining < kBlockSize ? static_cast<unsigned>(remaining) : kBlockSize;
+    unsigned got = 0;
+    if (!ReadFile(in, buffer, wanted, &got, nullptr)) return -1;
+    if (got != 0 && !WriteFile(out, buffer, got, nullptr, nullptr)) return -1;
+    return got;
+}
+
+// Copies size bytes; false when the source ended early or an error stopped
+// the copy. Each step moves at least one byte or ends the loop.
+bool copyData(int in, int out, unsigned long long size) {
+    bool kernelCopy = true;
+    while (size != 0) {
+        long long moved = moveSome(in, out, size, kernelCopy);
+        if (moved <= 0) return false;
+        size -= static_cast<unsigned long long>(moved);
+    }
+    return true;
+}
+
+// The copy of one regular file, from opening both ends to removing the
+// source of a move.
+int copyContents(zkFilename& source, zkFilename& destination, const Options& options) {
+    int in = CreateFile(source.m_path, O_RDONLY, kReadAccess, 0, 0, kCreatedMode, nullptr);
+    if (in == -1) return 1;
+    struct stat from, to;
+    bool refused = fstat(in, &from) != 0 || !S_ISREG(from.st_mode);
+    // Opening the destination truncates it, so a destination that is the
+    // source under another name is caught before, and so is a FIFO, whose
+    // open would wait for a reader.
+    if (!refused && stat(destination.GetFullPath(), &to) == 0) refused = sameFile(from, to) || S_ISFIFO(to.st_mode);
+    if (refused) {
+        CloseHandle(in);
+        return 1;
+    }
+    int out = CreateFile(destination.m_path, O_CREAT | O_WRONLY, kWriteAccess, 0,
+                         options.overwrite ? O_TRUNC : O_EXCL, kCreatedMode, nullptr);
+    if (out == -1) {
+        CloseHandle(in);
+        return 1;
+    }
+
+    unsigned high = 0;
+    unsigned low = GetFileSize(in, &high);
+    unsigned long long size = (static_cast<unsigned long long>(high) << kHighShift) | low;
+    bool complete = copyData(in, out, size);
+    // The source of a move goes only once its copy is on disk.
+    if (complete && options.deleteSource) complete = fsync(out) == 0;
+    // Only a regular file is removed after a failure: a device written to
+    // stays where it is.
+    bool removable = fstat(out, &to) == 0 && S_ISREG(to.st_mode);
+    if (!CloseHandle(out)) complete = false;
+    CloseHandle(in);
+
+    if (!complete) {
+        if (removable) unlink(destination.GetFullPath());
+        return 1;
+    }
+    if (options.deleteSource && unlink(source.GetFullPath()) != 0) return 1;
+    return 0;
+}
+
+int copyOne(zkFilename& source, zkFilename& destination, const Options& options, Root& root) {
+    int type = source.GetType();
+    if (type == 0) return 1;
+    if (type == 1) {
+        // The whole path becomes the directory part, so that /a/src and
+        // /a/src/ both copy the entries of src.
+        std::string dir = asDirectory(source.GetFullPath());
+        zkFilename::Dup(&source.m_dir, dir.c_str(), -1);
+        zkFilename::Dup(&source.m_fname, kAllEntries, -1);
+        zkFilename::Dup(&source.m_ext, nullptr, -1);
+        source.Rebuild(0, 0, 0, 0, 0);
+        return copyEntries(source, destination, options, root);
+    }
+    // An empty directory part is the current directory, which exists.
+    const char* destinationDir = destination.GetDirectory();
+    if (options.makeDir == 1 && *destinationDir != '\0' && !zkFileManager::CreateDirectory(destinationDir, nullptr))
+        return 1;
+    zkStringBase protocol(source.GetProtocol());
+    if (protocol.equals("ftp", true) || protocol.equals("http", true)) return 1;
+    if (options.symLink) return symlink(source.GetFullPath(), destination.GetFullPath()) == 0 ? 0 : 1;
+
+    if (std::strchr(destination.GetName(), '*')) destination.SetName(source.GetName());
+    if (std::strchr(destination.GetName(), '?')) destination.SetName(source.GetName());
+    if (*destination.GetName() == '\0') {
+        // Both parts before the one Rebuild, so a dotted name stays whole.
+        zkFilename::Dup(&destination.m_fname, source.GetName(), -1);
+        zkFilename::Dup(&destination.m_ext, source.GetExtension(), -1);
+        destination.Rebuild(0, 0, 0, 0, 0);
+    }
+    if (zkStringBase::equalStrings(destination.GetFullPath(), source.GetFullPath(), false)) return 1;
+    if (type != 2) return 1;
+    return copyContents(source, destination, options);
+}
+
+// A symbolic link of a copied tree that leads to a directory is made again
+// with the same target text instead of being followed, so links that point
+// back up the tree cannot make the copy endless.
+int copyLink(const std::string& from, const std::string& to, const Options& options) {
+    std::vector<char> target(kFirstLinkBuffer);
+    ssize_t n;
+    while ((n = readlink(from.c_str(), target.data(), target.size())) == static_cast<ssize_t>(target.size()))
+        target.resize(target.size() * 2);
+    if (n < 0) return 1;
+    target[static_cast<size_t>(n)] = '\0';
+
+    struct stat old, link;
+    if (options.overwrite && lstat(to.c_str(), &old) == 0 && !S_ISDIR(old.st_mode)) {
+        if (lstat(from.c_str(), &link) != 0 || sameFile(old, link) || unlink(to.c_str()) != 0) return 1;
+    }
+    if (symlink(target.data(), to.c_str()) != 0) return 1;
+    if (options.deleteSource && unlink(from.c_str()) != 0) return 1;
+    return 0;
+}
+
+// The directory copy: destination becomes a directory and receives every
+// entry of source's directory that matches source's name part.
+int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, Root& root) {
+    // A link for the whole directory is tried first. Its path is the
+    // destination's directory part, which ends in '/', and symlink refuses a
+    // new path that ends so; the entries are then linked one by one below.
+    if (options.symLink && symlink(source.GetDirectory(), destination.GetDirectory()) == 0) return 0;
+    if (!zkFileManager::CreateDirectory(destination.GetFullPath(), nullptr)) return 1;
+    // The entries go inside the destination also when its path does not end in '/'.
+    std::string destinationDir = asDirectory(destination.GetFullPath());
+    if (!root.known) {
+        struct stat st;
+        if (stat(destinationDir.c_str(), &st) != 0) return 1;
+        root.known = true;
+        root.dev = st.st_dev;
+        root.ino = st.st_ino;
+    }
+
+    std::string sourceDir = source.GetDirectory();
+    int failed = 0;
+    for (zkDirIterator it(source.GetFullPath()), end; it != end; ++it) {
+        const char* name = it.GetName();
+        if (std::strcmp(name, ".") == 0 || std::strcmp(name, "..") == 0) continue;
+        std::string from = sourceDir + name;
+        std::string to = destinationDir + name;
+        struct stat st;
+        if (lstat(from.c_str(), &st) != 0) {
+            ++failed;
+            continue;
+        }
+        bool link = S_ISLNK(st.st_mode);
+        bool directory = link ? zkFilename::IsDirectory(from.c_str()) != 0 : S_ISDIR(st.st_mode);
+        if (directory && !options.recursive) continue;
+        if (directory && link) {
+            failed += copyLink(from, to, options);
+            continue;
+        }
+        if (directory && st.st_dev == root.dev && st.st_ino == root.ino) continue;
+        // Entry names are taken literally: a name holding '*' or '?' is one file.
+        zkFilename entry(from.c_str());
+        zkFilename target(to.c_str());
+        failed += copyOne(entry, target, options, root);
+    }
+    return failed;
+}
+
+}  // namespace
+
+int zkFileManager::CopyFile(zkFilename& source, zkFilename& destination, unsigned recursive, unsigned makeDir,
+                            unsigned overwrite, unsigned symLink, unsigned deleteSource, const char*, const char*) {
+    Options options{recursive, makeDir, overwrite, symLink, deleteSource};
+    Root root;
+    if (hasWildcard(source.GetFullPath())) return copyEntries(source, destination, options, root);
+    return copyOne(source, destination, options, root);
+}
+
+int zkFileManager::CopyFile(zkStringBase& source, zkStringBase& destination, unsigned recursive, unsigned makeDir,
+                            unsigned overwrite, unsigned symLink, unsigned deleteSource, const char* reserved1,
+                            const char* reserved2) {
+    zkFilename from(source.data());
+    zkFilename to(destination.data());
+    return CopyFile(from, to, recursive, makeDir, overwrite, symLink, deleteSource, reserved1, reserved2);
+}

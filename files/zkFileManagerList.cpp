@@ -1,0 +1,148 @@
+#include "zkFileManager.h"
+
+#include <dirent.h>
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cstring>
+#include <new>
+
+#include "../internal/zkOutOfMemory.h"
+
+namespace {
+
+// Appends a copy of value; a list node that cannot be allocated ends the
+// process as the library's containers do.
+template <class T>
+void appendTo(std::list<T>& list, const T& value) {
+    try {
+        list.push_back(value);
+    } catch (const std::bad_alloc&) {
+        zkOutOfMemory();
+    }
+}
+
+bool isDotOrDotDot(const char* name) {
+    return name[0] == '.' && (name[1] == '\0' || (name[1] == '.' && name[2] == '\0'));
+}
+
+// A directory stream over a descriptor, which it owns from construction
+// on (also when the stream cannot be made) and closes with the stream.
+class Directory {
+public:
+    // -1 gives a directory without a stream.
+    explicit Directory(int fd) : m_stream(fd == -1 ? nullptr : fdopendir(fd)) {
+        if (fd != -1 && m_stream == nullptr) close(fd);
+    }
+    ~Directory() {
+        if (m_stream) closedir(m_stream);
+    }
+    Directory(const Directory&) = delete;
+    Directory& operator=(const Directory&) = delete;
+
+    static int openPath(const char* path) { return open(path, O_RDONLY | O_DIRECTORY | O_CLOEXEC); }
+
+    DIR* stream() const { return m_stream; }
+    int fd() const { return dirfd(m_stream); }
+
+private:
+    DIR* m_stream;
+};
+
+// The folders of one directory, opened as fd, whose names relative to root
+// start with relative.
+void listFolders(int fd, const zkStringBase& root, const zkStringBase& relative, std::list<zkStringBase>& folders,
+                 unsigned recursive, unsigned fullPaths) {
+    Directory dir(fd);
+    if (dir.stream() == nullptr) return;
+    while (const dirent* entry = readdir(dir.stream())) {
+        if (isDotOrDotDot(entry->d_name)) continue;
+        // The entry type from readdir saves a stat for everything but links
+        // and file systems that leave it unknown.
+        bool folder = entry->d_type == DT_DIR;
+        bool viaLink = entry->d_type == DT_LNK;
+        struct stat st;
+        if (entry->d_type == DT_UNKNOWN) {
+            if (fstatat(dir.fd(), entry->d_name, &st, AT_SYMLINK_NOFOLLOW) != 0) continue;
+            viaLink = S_ISLNK(st.st_mode);
+            folder = S_ISDIR(st.st_mode);
+        }
+        if (viaLink) folder = fstatat(dir.fd(), entry->d_name, &st, 0) == 0 && S_ISDIR(st.st_mode);
+        if (!folder) continue;
+
+        zkStringBase name(entry->d_name);
+        zkStringBase below;
+        zkFileManager::MakePath(below, relative, name, 0u);
+        if (fullPaths) {
+            zkStringBase full;
+            zkFileManager::MakePath(full, root, relative, name);
+            appendTo(folders, full);
+        } else {
+            appendTo(folders, below);
+        }
+        // A folder reached through a link is listed but not entered, so a
+        // link back up the tree cannot make the walk endless. The folder is
+        // opened by its entry, which no separator rewriting can misname.
+        if (recursive && !viaLink) {
+            int child = openat(dir.fd(), entry->d_name, O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC);
+            if (child != -1) listFolders(child, root, below, folders, recursive, fullPaths);
+        }
+    }
+}
+
+}  // namespace
+
+int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<zkFileInfo>& files,
+                               unsigned fullPaths) {
+    zkFilename filter(nullptr);
+    zkFilename::Dup(&filter.m_dir, dir, -1);
+    filter.Rebuild(0, 0, 0, 0, 0);
+    if (access(filter.GetFullPath(), F_OK) != 0) return 1;
+    zkFilename::Dup(&filter.m_fname, pattern, -1);
+    filter.Rebuild(0, 0, 0, 0, 0);
+
+    Directory listing(Directory::openPath(filter.GetDirectory()));
+    if (listing.stream() == nullptr) return 0;
+    zkFileInfo record;
+    while (const dirent* entry = readdir(listing.stream())) {
+        // Folders are known from readdir without a stat, and the extension
+        // is compared before the one stat of a candidate.
+        if (entry->d_type == DT_DIR) continue;
+        zkFilename name(entry->d_name);
+        if (std::strcmp(name.GetExtension(), filter.GetExtension()) != 0) continue;
+        struct stat st;
+        if (fstatat(listing.fd(), entry->d_name, &st, 0) == 0) {
+            if (S_ISDIR(st.st_mode)) continue;
+        } else if (fstatat(listing.fd(), entry->d_name, &st, AT_SYMLINK_NOFOLLOW) != 0) {
+            // Gone since readdir: nothing left to describe.
+            continue;
+        }
+        // A link whose target is missing is described by the link itself.
+        zkFilename::Dup(&record.m_file.m_ext, name.GetExtension(), -1);
+        zkFilename::Dup(&record.m_file.m_fname, name.GetName(), -1);
+        record.m_file.Rebuild(0, 0, 0, 0, 0);
+        record.m_size = static_cast<unsigned long long>(st.st_size);
+        record.m_ctime = static_cast<long long>(st.st_ctime);
+        record.m_atime = static_cast<long long>(st.st_atime);
+        record.m_mtime = static_cast<long long>(st.st_mtime);
+        record.m_mode = static_cast<unsigned>(st.st_mode);
+        if (fullPaths) record.m_file.SetDirectory(dir);
+        appendTo(files, record);
+    }
+    return 0;
+}
+
+int zkFileManager::GetFolderList(const char* root, const char* relative, std::list<zkStringBase>& folders,
+                                 unsigned recursive, unsigned fullPaths) {
+    zkStringBase rootPath(root);
+    zkStringBase relativePath(relative);
+    zkStringBase path;
+    MakePath(path, rootPath, relativePath, 0u);
+    zkFilename folder(nullptr);
+    zkFilename::Dup(&folder.m_dir, path.data(), -1);
+    folder.Rebuild(0, 0, 0, 0, 0);
+    if (access(folder.GetFullPath(), F_OK) != 0) return 1;
+    listFolders(Directory::openPath(folder.GetDirectory()), rootPath, relativePath, folders, recursive, fullPaths);
+    return 0;
+}
