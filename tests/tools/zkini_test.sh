@@ -101,24 +101,12 @@ port=8080
 merge)
     run 0 "$@" -file:a.ini -merge:b.ini -out:m.ini
     unchanged
-    same m.ini '[server]
-host=0.0.0.0
-port=9090
-# seconds before an idle connection is closed
-timeout=30
-
-[database]
-url=postgres://localhost/app
-pool=4
-
-[IPsBehindFirewall]
-10.0.0.5=web
-10.0.0.6=db
+    same m.ini "$(printf '%s' "$normal_form" | sed 's/^port=8080$/port=9090/')
 
 [cache]
 size=256
 
-'
+"
     run 2 "$@" -file:a.ini -merge:none.ini
     grep -q "cannot read none.ini: No such file or directory" err.txt || fail "no reason for the missing merge file"
     unchanged
@@ -127,21 +115,9 @@ forms)
     run 0 "$@" -file:a.ini -normalize -out:n.ini
     same n.ini "$normal_form"
     run 0 "$@" -file:a.ini -firewall -out:f.ini
-    same f.ini '[server]
-host=0.0.0.0
-port=8080
-# seconds before an idle connection is closed
-timeout=30
+    same f.ini "$(printf '%s' "$normal_form" | sed 's/^\(10\.0\.0\.[56]\)=/\1/')
 
-[database]
-url=postgres://localhost/app
-pool=4
-
-[IPsBehindFirewall]
-10.0.0.5web
-10.0.0.6db
-
-'
+"
     run 0 "$@" -file:a.ini -normalize
     same a.ini "$normal_form"
     ;;
