@@ -2,6 +2,7 @@
 
 #include <errno.h>
 #include <fcntl.h>
+#include <stdlib.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -23,6 +24,9 @@ constexpr int kHighShift = 32;
 constexpr unsigned kReadAccess = 0444;
 constexpr unsigned kWriteAccess = 0222;
 constexpr unsigned kCreatedMode = 0664;
+constexpr mode_t kPermissionBits = 07777;
+// The file beside an overwritten destination that receives the new copy.
+constexpr const char* kTemporarySuffix = ".zkcopy-XXXXXX";
 
 constexpr char kSeparator = '/';
 constexpr const char* kAllEntries = "*";
@@ -111,8 +115,30 @@ int copyContents(zkFilename& source, zkFilename& destination, const Options& opt
         CloseHandle(in);
         return 1;
     }
-    int out = CreateFile(destination.m_path, O_CREAT | O_WRONLY, kWriteAccess, 0,
+    // An existing regular file that is overwritten is replaced only once the
+    // new copy is whole: the data goes to a file beside it, which takes the
+    // old file's mode and owner and is renamed over it. A failed copy leaves
+    // the old file as it was. Links and devices are written through, and so
+    // is a file in a directory where no new file can be made.
+    struct stat old;
+    bool replace = options.overwrite && lstat(destination.GetFullPath(), &old) == 0 && S_ISREG(old.st_mode);
+    std::string temporary;
+    int out = -1;
+    if (replace) {
+        temporary = std::string(destination.GetFullPath()) + kTemporarySuffix;
+        out = mkostemp(&temporary[0], O_CLOEXEC);
+        if (out != -1 && (fchmod(out, old.st_mode & kPermissionBits) != 0 ||
+                          (fchown(out, old.st_uid, old.st_gid) != 0 && errno != EPERM))) {
+            CloseHandle(out);
+            unlink(temporary.c_str());
+            out = -1;
+        }
+        replace = out != -1;
+    }
+    if (!replace) {
+        out = CreateFile(destination.m_path, O_CREAT | O_WRONLY, kWriteAccess, 0,
                          options.overwrite ? O_TRUNC : O_EXCL, kCreatedMode, nullptr);
+    }
     if (out == -1) {
         CloseHandle(in);
         return 1;
@@ -122,15 +148,20 @@ int copyContents(zkFilename& source, zkFilename& destination, const Options& opt
     unsigned low = GetFileSize(in, &high);
     unsigned long long size = (static_cast<unsigned long long>(high) << kHighShift) | low;
     bool complete = copyData(in, out, size);
-    // The source of a move goes only once its copy is on disk.
-    if (complete && options.deleteSource) complete = fsync(out) == 0;
+    // The source of a move, or the file being replaced, goes only once its
+    // copy is on disk.
+    if (complete && (options.deleteSource || replace)) complete = fsync(out) == 0;
     // Only a regular file is removed after a failure: a device written to
     // stays where it is.
     bool removable = fstat(out, &to) == 0 && S_ISREG(to.st_mode);
     if (!CloseHandle(out)) complete = false;
     CloseHandle(in);
 
-    if (!complete) {
+    if (replace) {
+        if (complete) complete = rename(temporary.c_str(), destination.GetFullPath()) == 0;
+        if (!complete) unlink(temporary.c_str());
+        if (!complete) return 1;
+    } else if (!complete) {
         if (removable) unlink(destination.GetFullPath());
         return 1;
     }

@@ -19,7 +19,10 @@
 // not stored. A UTF-8 byte-order mark at the start of the file is skipped.
 //
 // Writing. Each section as "[name]", then its lines as "key=value" or as the
-// comment text, then one empty line; every line ends with LF. The file is
+// comment text, then one empty line; every line ends with LF. A line that
+// would be one character long (a lone comment character, or "=" for an empty
+// key and value) gets a blank after it, since loading ignores such a line;
+// the firewall form's bare keys are written as they are. The file is
 // replaced as a whole: the text goes to a new file in the same directory,
 // which is flushed to disk and renamed over the old one, so a failed save
 // leaves the old file as it was. The new file keeps the old one's permission

@@ -17,6 +17,9 @@ namespace {
 // The section whose key lines CloseFW writes without "=".
 constexpr char kFirewallSection[] = "IPsBehindFirewall";
 
+// The blank that may follow a line of one character.
+constexpr unsigned long long kLinePad = 1;
+
 // The longest text a zkStringBase can hold.
 constexpr unsigned long long kMaxStringLength = 0xFFFFFFFEull;
 
@@ -74,8 +77,9 @@ int writeSections(zkBasicFile& file, const std::list<INISection*>& sections, boo
         // "[", name, "]", LF, then the lines, then the empty line.
         unsigned long long size = section->m_name.length() + 4ull;
         for (const INILine* line : *section->m_lines) {
-            size += line->m_value.length() + 1ull;
-            if (!line->m_isComment) size += line->m_key.length() + (bare ? 0ull : 1ull);
+            unsigned long long length = line->m_value.length();
+            if (!line->m_isComment) length += line->m_key.length() + (bare ? 0ull : 1ull);
+            size += length + (!bare && length == 1 ? kLinePad : 0ull) + 1ull;
         }
         if (size > kMaxStringLength) {
             errno = EOVERFLOW;
@@ -86,11 +90,18 @@ int writeSections(zkBasicFile& file, const std::list<INISection*>& sections, boo
 
         text.append('[').append(section->m_name).append(']').append('\n');
         for (const INILine* line : *section->m_lines) {
+            const unsigned start = text.length();
             if (!line->m_isComment) {
                 text.append(line->m_key);
                 if (!bare) text.append('=');
             }
-            text.append(line->m_value).append('\n');
+            text.append(line->m_value);
+            // Loading ignores a line of one character, so a lone comment
+            // character or a lone "=" would be lost; a blank after it is cut
+            // off again when the line is read. The bare keys of the firewall
+            // form are written as they are.
+            if (!bare && text.length() - start == 1) text.append(' ');
+            text.append('\n');
         }
         text.append('\n');
         if (writeAll(file, text) != 0) return 1;

@@ -18,16 +18,23 @@ constexpr mode_t kDefaultDirMode = 0777;
 int zkCreateDir(const char* path, void* attributes) {
     if (path == nullptr || *path == '\0') return 0;
     mode_t mode = attributes ? static_cast<mode_t>(*static_cast<const unsigned*>(attributes)) : kDefaultDirMode;
-    // Each directory above is made in turn; one that is already there is no
-    // error, and any real failure shows in the final test.
+    // Back from the end to the deepest directory that exists or can be made
+    // at once, then forward making the rest: a path whose parent exists costs
+    // one mkdir, however deep it lies. Any real failure shows in the final
+    // test.
     std::string partial(path);
-    for (size_t i = 1; i < partial.size(); ++i) {
-        if (partial[i] != kSeparator || partial[i - 1] == kSeparator) continue;
-        partial[i] = '\0';
-        mkdir(partial.c_str(), mode);
-        partial[i] = kSeparator;
+    size_t end = partial.size();
+    while (mkdir(partial.substr(0, end).c_str(), mode) != 0 && errno == ENOENT) {
+        size_t slash = partial.rfind(kSeparator, end - 1);
+        while (slash != std::string::npos && slash > 0 && partial[slash - 1] == kSeparator) --slash;
+        if (slash == std::string::npos || slash == 0) break;
+        end = slash;
     }
-    mkdir(path, mode);
+    while (end < partial.size()) {
+        end = partial.find(kSeparator, end + 1);
+        if (end == std::string::npos) end = partial.size();
+        if (partial[end - 1] != kSeparator) mkdir(partial.substr(0, end).c_str(), mode);
+    }
     return zkFilename::IsDirectory(path);
 }
 
