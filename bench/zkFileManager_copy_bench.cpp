@@ -1,8 +1,7 @@
 // CopyFile of one large file against the system's cp, in the same run and
 // on the same file system, with the page cache warm. Prints the median time
-// of each and their ratio. The files go to ZK_BENCH_DIR, else the current
+// of each, for bench/run.sh. The files go to ZK_BENCH_DIR, else the current
 // directory, and are removed at the end.
-#include <benchmark/benchmark.h>
 #include <spawn.h>
 #include <stdio.h>
 #include <stdlib.h>
@@ -10,10 +9,10 @@
 #include <unistd.h>
 
 #include <fstream>
-#include <map>
 #include <string>
 #include <vector>
 
+#include "zkBenchPairs.h"
 #include "zkFileManager.h"
 
 extern char** environ;
@@ -22,7 +21,6 @@ namespace {
 
 constexpr size_t kFileSize = 512u << 20;
 constexpr size_t kWriteChunk = 1u << 20;
-constexpr int kRepetitions = 7;
 
 std::string g_source, g_target;
 
@@ -72,25 +70,12 @@ void copyWithCp(benchmark::State& state) {
     state.SetBytesProcessed(static_cast<long long>(state.iterations() * kFileSize));
 }
 
-BENCHMARK(copyWithLibrary)->Iterations(1)->Repetitions(kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(copyWithCp)->Iterations(1)->Repetitions(kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond);
-
-// Keeps the median real time of each benchmark besides printing as usual.
-class MedianReporter : public benchmark::ConsoleReporter {
-public:
-    void ReportRuns(const std::vector<Run>& runs) override {
-        ConsoleReporter::ReportRuns(runs);
-        for (const Run& run : runs)
-            if (run.run_type == Run::RT_Aggregate && run.aggregate_name == "median")
-                medians[run.run_name.function_name] = run.GetAdjustedRealTime();
-    }
-    std::map<std::string, double> medians;
-};
+BENCHMARK(copyWithLibrary)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(copyWithCp)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond);
 
 }  // namespace
 
 int main(int argc, char** argv) {
-    benchmark::Initialize(&argc, argv);
     const char* dir = getenv("ZK_BENCH_DIR");
     std::string base = std::string(dir && *dir ? dir : ".") + "/zk_copy_bench.";
     g_source = base + "source";
@@ -100,14 +85,11 @@ int main(int argc, char** argv) {
         unlink(g_source.c_str());
         return 1;
     }
-    MedianReporter reporter;
-    benchmark::RunSpecifiedBenchmarks(&reporter);
+    zkbench::MedianReporter reporter;
+    zkbench::runInterleaved(argc, argv, reporter);
     unlink(g_source.c_str());
     unlink(g_target.c_str());
-    double library = reporter.medians["copyWithLibrary"], cp = reporter.medians["copyWithCp"];
-    if (library > 0 && cp > 0)
-        printf("median CopyFile %.1f ms, cp %.1f ms: CopyFile takes %.2f times as long as cp\n", library, cp,
-               library / cp);
+    zkbench::printPair(reporter, "CopyFile / cp", "copyWithLibrary", "copyWithCp", "ms", 1.15);
     benchmark::Shutdown();
     return 0;
 }

@@ -51,6 +51,10 @@ void deleteOwned(T* p) {
 
 }  // namespace
 
+// The most entries the table is sized for ahead of a parse; a longer
+// command string lets the table grow as it fills.
+constexpr std::size_t kMaxReservedEntries = std::size_t{1} << 16;
+
 struct zkCommandLineParser::Table {
     // Every name is hashed on its folded bytes, whatever its compare type, so
     // that names equal without regard to case share a bucket and a
@@ -81,6 +85,23 @@ struct zkCommandLineParser::Table {
     using Entry = std::pair<const zkStringBase, zkStringBase>;
     std::unordered_map<zkStringBase, zkStringBase, Hash, Equal, zkNodeAllocator<Entry>> map{kInitialBuckets};
 };
+
+namespace {
+
+// Sizes the table for one entry per switch character of [p, end), an upper
+// bound on what the parse can add, so that the table is not rebuilt while it
+// fills. Only the bucket count changes, which nothing outside the table sees.
+template <class Map>
+void reserveEntries(Map& map, const char* p, const char* end, char switchChar) {
+    std::size_t switches = 0;
+    while (switches < kMaxReservedEntries && (p = findIn(p, end, switchChar)) != nullptr) {
+        ++switches;
+        ++p;
+    }
+    if (switches > map.bucket_count()) map.reserve(switches);
+}
+
+}  // namespace
 
 zkCommandLineParser::zkCommandLineParser()
     : m_valid(0),
@@ -125,6 +146,7 @@ int zkCommandLineParser::ParseCommand() {
 int zkCommandLineParser::ParseCmdLine() {
     const char* p = m_command.data();
     const char* const end = p + m_command.length();
+    reserveEntries(m_values->map, p, end, m_switchChar);
     zkStringBase name;
     zkStringBase value;
 
@@ -212,18 +234,23 @@ int zkCommandLineParser::Validate() {
 }
 
 void zkCommandLineParser::store(const zkStringBase& name, const zkStringBase& value) {
-    auto& map = m_values->map;
-    auto it = map.find(name);
-    if (it != map.end()) {
-        it->second = value;
-        return;
+    // New entries get buffers sized to their text (length + 1) rather than
+    // copies of the parse's reused buffers, whose capacity is that of the
+    // longest item seen. The key is const inside the table, so it is copied
+    // from a sized string; the copy keeps that capacity. Names are mostly
+    // new, so the entry is built first and the table searched once; an
+    // existing name drops the new entry and keeps its own.
+    zkStringBase sizedName(name.length() + 1u);
+    if (!name.isNull()) sizedName.append(name.data(), name.length());
+    auto placed = m_values->map.emplace(std::piecewise_construct, std::forward_as_tuple(sizedName),
+                                        std::forward_as_tuple(value.length() + 1u));
+    zkStringBase& stored = placed.first->second;
+    if (placed.second) {
+        if (!value.isNull()) stored.append(value.data(), value.length());
+        stored.setCompareType(value.getCompareType());
+    } else {
+        stored = value;
     }
-    // New entries get buffers sized to their text rather than copies of the
-    // parse's reused buffers, whose capacity is that of the longest item seen.
-    it = map.emplace(std::piecewise_construct, std::forward_as_tuple(name.data(), name.length()),
-                     std::forward_as_tuple(value.data(), value.length()))
-             .first;
-    it->second.setCompareType(value.getCompareType());
 }
 
 const zkStringBase* zkCommandLineParser::lookUp(const zkStringBase& name) const {

@@ -23,6 +23,27 @@ void appendTo(std::list<T>& list, const T& value) {
     }
 }
 
+// Appends an empty record and returns it, ending the process as above when
+// its node cannot be allocated.
+zkFileInfo& appendFresh(std::list<zkFileInfo>& list) {
+    try {
+        list.emplace_back();
+    } catch (const std::bad_alloc&) {
+        zkOutOfMemory();
+    }
+    return list.back();
+}
+
+// Where the extension's dot is in an entry name of n bytes, or n when it has
+// none, by zkFilename's rule: the last dot, unless it is the first or the
+// last character.
+size_t extensionDot(const char* name, size_t n) {
+    for (size_t i = n; i-- > 1;) {
+        if (name[i] == '.') return i + 1 < n ? i : n;
+    }
+    return n;
+}
+
 bool isDotOrDotDot(const char* name) {
     return name[0] == '.' && (name[1] == '\0' || (name[1] == '.' && name[2] == '\0'));
 }
@@ -104,23 +125,28 @@ int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<z
 
     Directory listing(Directory::openPath(filter.GetDirectory()));
     if (listing.stream() == nullptr) return 0;
-    zkFileInfo record;
+    const char* const wanted = filter.GetExtension();
     while (const dirent* entry = readdir(listing.stream())) {
         // Folders are known from readdir without a stat, and the extension
         // is compared before the one stat of a candidate.
         if (entry->d_type == DT_DIR) continue;
-        zkFilename name(entry->d_name);
-        if (std::strcmp(name.GetExtension(), filter.GetExtension()) != 0) continue;
+        const char* const name = entry->d_name;
+        const size_t length = std::strlen(name);
+        const size_t dot = extensionDot(name, length);
+        if (std::strcmp(dot < length ? name + dot + 1 : "", wanted) != 0) continue;
         struct stat st;
-        if (fstatat(listing.fd(), entry->d_name, &st, 0) == 0) {
+        if (fstatat(listing.fd(), name, &st, 0) == 0) {
             if (S_ISDIR(st.st_mode)) continue;
-        } else if (fstatat(listing.fd(), entry->d_name, &st, AT_SYMLINK_NOFOLLOW) != 0) {
+        } else if (fstatat(listing.fd(), name, &st, AT_SYMLINK_NOFOLLOW) != 0) {
             // Gone since readdir: nothing left to describe.
             continue;
         }
         // A link whose target is missing is described by the link itself.
-        zkFilename::Dup(&record.m_file.m_ext, name.GetExtension(), -1);
-        zkFilename::Dup(&record.m_file.m_fname, name.GetName(), -1);
+        // The record is made in its list node rather than copied there; its
+        // parts are set and rebuilt as on any fresh record.
+        zkFileInfo& record = appendFresh(files);
+        zkFilename::Dup(&record.m_file.m_ext, dot < length ? name + dot + 1 : "", -1);
+        zkFilename::Dup(&record.m_file.m_fname, name, static_cast<int>(dot));
         record.m_file.Rebuild(0, 0, 0, 0, 0);
         record.m_size = static_cast<unsigned long long>(st.st_size);
         record.m_ctime = static_cast<long long>(st.st_ctime);
@@ -128,7 +154,6 @@ int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<z
         record.m_mtime = static_cast<long long>(st.st_mtime);
         record.m_mode = static_cast<unsigned>(st.st_mode);
         if (fullPaths) record.m_file.SetDirectory(dir);
-        appendTo(files, record);
     }
     return 0;
 }

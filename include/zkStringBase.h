@@ -260,6 +260,9 @@ public:
     zkStringBase& stripWhite(StripType bits);
 
 protected:
+    // The tokenizer fills its tokens in place, one per call, in a hot loop.
+    friend class zkBStringTokenizer;
+
     char* m_data;
     unsigned m_length;
     unsigned m_capacity;

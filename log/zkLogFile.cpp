@@ -18,6 +18,19 @@ constexpr unsigned kShortYearTo = 3;
 constexpr long kOneDigitMax = 9;
 constexpr long kTwoDigitsMax = 99;
 
+// The years written with four digits, of which the date shows the last two.
+constexpr long kFirstFourDigitYear = 1000;
+constexpr long kLastFourDigitYear = 9999;
+constexpr long kCentury = 100;
+constexpr int kDecimal = 10;
+
+// Appends n, which lies within [0, 99], as two digits.
+void appendTwoDigits(zkStringBase& out, int n) {
+    assert(n >= 0 && n <= kTwoDigitsMax);
+    out.append(static_cast<char>('0' + n / kDecimal));
+    out.append(static_cast<char>('0' + n % kDecimal));
+}
+
 }  // namespace
 
 zkLogFile::zkLogFile() : m_options(), m_level(LevelNormal), m_entries(0), m_display(0) {
@@ -124,22 +137,29 @@ void zkLogFile::GetCurrTimeAndDate(zkStringBase& time, zkStringBase& date) {
     struct tm local;
     if (now == static_cast<std::time_t>(-1) || localtime_r(&now, &local) == nullptr) return;
 
-    MakeTDNum(m_number, local.tm_hour, 0);
-    time.append(m_number).append(':');
-    MakeTDNum(m_number, local.tm_min, 0);
-    time.append(m_number).append(':');
-    MakeTDNum(m_number, local.tm_sec, 0);
-    time.append(m_number);
+    // The fields of a calendar time all lie within [0, 99], where two digits
+    // are exactly what MakeTDNum gives; they are written directly, without
+    // formatting a number each.
+    appendTwoDigits(time, local.tm_hour);
+    time.append(':');
+    appendTwoDigits(time, local.tm_min);
+    time.append(':');
+    appendTwoDigits(time, local.tm_sec);
 
-    MakeTDNum(m_number, local.tm_mon + 1, 0);
-    date.append(m_number).append('/');
-    MakeTDNum(m_number, local.tm_mday, 0);
-    date.append(m_number).append('/');
-    MakeTDNum(m_number, static_cast<long>(local.tm_year) + kYearBase, 0);
-    if (m_number.length() == kFullYearDigits) {
-        date.appendSubString(m_number, kShortYearFrom, kShortYearTo);
+    appendTwoDigits(date, local.tm_mon + 1);
+    date.append('/');
+    appendTwoDigits(date, local.tm_mday);
+    date.append('/');
+    const long year = static_cast<long>(local.tm_year) + kYearBase;
+    if (year >= kFirstFourDigitYear && year <= kLastFourDigitYear) {
+        appendTwoDigits(date, static_cast<int>(year % kCentury));
     } else {
-        date.append(m_number);
+        MakeTDNum(m_number, year, 0);
+        if (m_number.length() == kFullYearDigits) {
+            date.appendSubString(m_number, kShortYearFrom, kShortYearTo);
+        } else {
+            date.append(m_number);
+        }
     }
 }
 

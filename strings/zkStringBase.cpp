@@ -144,6 +144,15 @@ void zkStringBase::spliceIn(unsigned pos, const char* s, unsigned n) {
     if (n == 0) return;
     // The limit is tested before anything is read from s.
     if (static_cast<unsigned long long>(m_length) + n + 1 > kMaxCapacity) throw std::bad_alloc();
+    if (pos == m_length && !pointsInto(s, m_data, m_capacity)) {
+        // An append from outside the buffer: nothing to move or protect but
+        // the byte at the end, which goes behind the new text as below.
+        growFor(n);
+        m_data[m_length + n] = m_data[m_length];
+        std::memcpy(m_data + m_length, s, n);
+        m_length += n;
+        return;
+    }
     std::string copy;
     if (pointsInto(s, m_data, m_capacity)) {
         // The source is part of this string: moving the text or replacing the
@@ -160,6 +169,14 @@ void zkStringBase::spliceIn(unsigned pos, const char* s, unsigned n) {
 zkStringBase& zkStringBase::append(const char* s, unsigned n) {
     if (s == nullptr) return *this;
     if (n == 0) n = static_cast<unsigned>(std::strlen(s));
+    if (n != 0 && static_cast<unsigned long long>(m_length) + n < m_capacity && !pointsInto(s, m_data, m_capacity)) {
+        // It fits and comes from elsewhere: what spliceIn does, without its
+        // growth and overlap checks.
+        m_data[m_length + n] = m_data[m_length];
+        std::memcpy(m_data + m_length, s, n);
+        m_length += n;
+        return *this;
+    }
     spliceIn(m_length, s, n);
     return *this;
 }

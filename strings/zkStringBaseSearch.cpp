@@ -13,6 +13,10 @@ constexpr int kFoldedMin = -128;
 constexpr int kFoldedRange = 384;
 constexpr int kByteRange = 256;
 
+// From this many bytes to search on, a folded search first builds a skip
+// table, whose cost is about that of trying this many positions one by one.
+constexpr unsigned kSkipTableMinSpan = 512;
+
 short signOfExactDifference(const char* a, const char* b, unsigned n) {
     int d = n ? std::memcmp(a, b, n) : 0;
     return static_cast<short>(d < 0 ? -1 : d > 0 ? 1 : 0);
@@ -28,6 +32,30 @@ int foldedDifference(const zkCaseTables& fold, const char* a, const char* b, uns
         if (d) return d;
     }
     return 0;
+}
+
+// The first position i in [start, last] where the n >= 2 bytes at data + i
+// match s as zkStringBase::find decides it (first byte through tolower, all
+// bytes through toupper), or BadIndex. A match needs every byte of the window
+// to fold as the pattern's byte does, so after a failed window the search may
+// move on to the next window that lines up the folded value of this window's
+// last byte with an equal folded value of the pattern (a bad-character skip).
+// Every window it stops at is checked with the same test the byte-by-byte
+// loop uses, so both give the same position in any locale.
+unsigned skipFoldedFind(const zkCaseTables& fold, const char* data, unsigned start, unsigned last, const char* s,
+                        unsigned n) {
+    unsigned shift[kFoldedRange];
+    for (unsigned& d : shift) d = n;
+    for (unsigned j = 0; j + 1 < n; ++j) shift[fold.upper(s[j]) - kFoldedMin] = n - 1 - j;
+    const int first = fold.lower(s[0]);
+    const int tail = fold.upper(s[n - 1]);
+    // i never passes last + n, the string's length, so it cannot wrap.
+    for (unsigned i = start; i <= last;) {
+        const int c = fold.upper(data[i + n - 1]);
+        if (c == tail && fold.lower(data[i]) == first && foldedDifference(fold, data + i, s, n) == 0) return i;
+        i += shift[c - kFoldedMin];
+    }
+    return zkStringBase::BadIndex;
 }
 
 // The first byte in [p, end) that equals any of the n bytes of set, or null.
@@ -169,6 +197,7 @@ unsigned zkStringBase::find(const char* s, unsigned start, unsigned n, bool case
     zkCaseTables fold;
     int first = fold.lower(s[0]);
     unsigned last = m_length - n;
+    if (n >= 2 && m_length - start >= kSkipTableMinSpan) return skipFoldedFind(fold, m_data, start, last, s, n);
     for (unsigned i = start; i <= last; ++i) {
         if (fold.lower(m_data[i]) == first && foldedDifference(fold, m_data + i, s, n) == 0) return i;
     }
