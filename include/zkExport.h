@@ -1,7 +1,7 @@
-// The export macro of libzkutil.
-//
-// The library is compiled with hidden visibility: only the classes and
-// functions marked ZK_API are visible to programs that link against it.
+/// The export macro of libzkutil.
+///
+/// The library is compiled with hidden visibility: only the classes and
+/// functions marked ZK_API are visible to programs that link against it.
 #ifndef ZK_EXPORT_H
 #define ZK_EXPORT_H
 
