@@ -3,14 +3,10 @@
 #include "zkLogFile.h"
 
 #include <gtest/gtest.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <ctime>
-#include <sstream>
 #include <string>
-#include <vector>
 
 #include "support/zkTempDir.h"
 
@@ -101,37 +97,4 @@ TEST(LogFile, MakeTDNumPadsWithSignedComparisons) {
         log.MakeTDNum(out, c.n, c.three);
         EXPECT_STREQ(c.text, out.data()) << c.n << " " << c.three;
     }
-}
-
-TEST(LogFile, ConcurrentProcessesKeepEveryEntryWhole) {
-    constexpr int kWriters = 4;
-    constexpr long kEntries = 2500;
-    zkTempDir dir;
-    const std::string path = dir.file("shared.log");
-    std::vector<std::string> expected;
-    for (int w = 0; w < kWriters; ++w) {
-        for (long n = 1; n <= kEntries; ++n)
-            expected.push_back(std::to_string(n) + ") writer " + std::to_string(w) + "." + std::to_string(n));
-        if (fork() != 0) continue;  // a failed fork shows in the wait below
-        zkLogFile log(zkStringBase(path.c_str()), 0);
-        log.SetOption(zkLogFile::OptionTimeStamp, 0);
-        log.SetOption(zkLogFile::OptionEntryNumber, 1);
-        for (long n = 1; n <= kEntries; ++n)
-            log.Log("writer", (std::to_string(w) + "." + std::to_string(n)).c_str(), Level(1));
-        _exit(0);
-    }
-    for (int w = 0; w < kWriters; ++w) {
-        int status = 0;
-        ASSERT_NE(-1, wait(&status));
-        EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
-    }
-    // Each process numbers its own entries: every line appears once, whole.
-    const std::string text = zkReadFile(path);
-    EXPECT_EQ('\n', text.empty() ? 0 : text.back());
-    std::vector<std::string> lines;
-    std::istringstream in(text);
-    for (std::string line; std::getline(in, line);) lines.push_back(line);
-    std::sort(lines.begin(), lines.end());
-    std::sort(expected.begin(), expected.end());
-    EXPECT_TRUE(lines == expected) << lines.size() << " lines";
 }
