@@ -7,13 +7,11 @@
 #include "support/zkTempDir.h"
 #include "zkMappedINIFile.h"
 
-inline std::string zkText(const zkStringBase& s) {
-    return std::string(s.data(), s.length());
-}
+inline std::string zkText(const zkStringBase& s) { return std::string(s.data(), s.length()); }
 
-inline zkStringBase zkStr(const char* text) {
-    return zkStringBase(text);
-}
+inline zkStringBase zkStr(const char* text) { return zkStringBase(text); }
+
+inline std::string zkTestData(const std::string& name) { return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name); }
 
 // "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
 inline std::string zkDump(zkMappedINIFile& ini) {
@@ -32,10 +30,6 @@ inline int zkLoad(zkMappedINIFile& ini, const zkTempDir& dir, const std::string&
     if (!zkWriteFile(dir.file(name), bytes)) return -1;
     ini.SetFilename(dir.file(name).c_str());
     return ini.Open(0);
-}
-
-inline std::string zkTestData(const std::string& name) {
-    return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name);
 }
 
 #endif

@@ -9,101 +9,46 @@
 
 namespace {
 
-using Tokens = std::vector<std::string>;
+zkStringBase str(const std::string& text) { return zkStringBase(text.data(), static_cast<unsigned>(text.size())); }
 
-const zkStringBase& kComma = zkBStringTokenizer::m_csvToken;
-
-// Every token the tokenizer hands out, in order, until it reports false.
-Tokens tokens(const zkStringBase& source, const zkStringBase& seps, bool strip = false) {
-    zkBStringTokenizer tok(source, seps, strip);
-    Tokens out;
-    zkStringBase token("junk");
-    while (out.size() < 64 && tok.GetNext(token)) {
-        EXPECT_EQ('\0', token.data()[token.length()]);
-        out.emplace_back(token.data(), token.length());
-    }
-    return out;
+std::string text(const zkStringBase& s) {
+    EXPECT_EQ('\0', s.data()[s.length()]);
+    return std::string(s.data(), s.length());
 }
-
-std::string text(const zkStringBase& s) { return std::string(s.data(), s.length()); }
 
 }  // namespace
 
-TEST(Tokenizer, SharedSeparatorSets) {
-    EXPECT_EQ(" ", text(zkBStringTokenizer::m_spToken));
-    EXPECT_EQ("\r\n", text(zkBStringTokenizer::m_crlfToken));
-    EXPECT_EQ(",", text(kComma));
-}
+// A source with k separator bytes gives k + 1 tokens; an empty source none.
+TEST(Tokenizer, OneMoreTokenThanSeparatorsReadAtEachCall) {
+    const std::string crlf = text(zkBStringTokenizer::m_crlfToken), comma = text(zkBStringTokenizer::m_csvToken);
+    const struct { std::string source, seps; bool strip; std::vector<std::string> tokens; } cases[] = {
+        {"a,b,d", comma, false, {"a", "b", "d"}}, {"abc", comma, false, {"abc"}}, {"", comma, false, {}},
+        {"a,,b", comma, false, {"a", "", "b"}},   {",a", comma, false, {"", "a"}}, {"a,", comma, false, {"a", ""}},
+        {",,,", comma, false, {"", "", "", ""}},  {"x\r\ny", crlf, false, {"x", "", "y"}}, {"a,b", "", false, {"a,b"}},
+        {" a , b ", comma, true, {"a", "b"}},     {" a , b ", comma, false, {" a ", " b "}},
+        {" \t;\tx y\n;\r", ";", true, {"", "x y", ""}}, {"k=v;w", "=;", false, {"k", "v", "w"}},
+        {"one two", text(zkBStringTokenizer::m_spToken), false, {"one", "two"}},
+        {{"a\0b", 3}, {"\0", 1}, false, {"a", "b"}}, {{"a\0b", 3}, comma, false, {{"a\0b", 3}}},
+    };
+    for (const auto& c : cases) {
+        const zkStringBase source = str(c.source), seps = str(c.seps);
+        zkBStringTokenizer tok(source, seps, c.strip);
+        std::vector<std::string> out;
+        zkStringBase token("junk");
+        while (out.size() < 64 && tok.GetNext(token)) out.push_back(text(token));
+        EXPECT_EQ(c.tokens, out) << c.source;
+    }
 
-TEST(Tokenizer, OneMoreTokenThanSeparators) {
-    EXPECT_EQ((Tokens{"a", "b", "d"}), tokens(zkStringBase("a,b,d"), kComma));
-    EXPECT_EQ((Tokens{"a", "b"}), tokens(zkStringBase("a,b"), kComma));
-    EXPECT_EQ((Tokens{"abc"}), tokens(zkStringBase("abc"), kComma));
-    EXPECT_EQ((Tokens{"x"}), tokens(zkStringBase("x"), kComma));
-    EXPECT_EQ((Tokens{"one", "two"}), tokens(zkStringBase("one two"), zkBStringTokenizer::m_spToken));
-    EXPECT_EQ((Tokens{}), tokens(zkStringBase(), kComma));
-}
-
-TEST(Tokenizer, EmptyTokensBetweenAdjacentSeparators) {
-    EXPECT_EQ((Tokens{"a", "", "b"}), tokens(zkStringBase("a,,b"), kComma));
-    EXPECT_EQ((Tokens{"", "a"}), tokens(zkStringBase(",a"), kComma));
-    EXPECT_EQ((Tokens{"a", ""}), tokens(zkStringBase("a,"), kComma));
-    EXPECT_EQ((Tokens{"", ""}), tokens(zkStringBase(","), kComma));
-    EXPECT_EQ((Tokens{"", "", "", ""}), tokens(zkStringBase(",,,"), kComma));
-    EXPECT_EQ((Tokens{"x", "", "y"}), tokens(zkStringBase("x\r\ny"), zkBStringTokenizer::m_crlfToken));
-    EXPECT_EQ((Tokens{"x", "y", ""}), tokens(zkStringBase("x\ny\r"), zkBStringTokenizer::m_crlfToken));
-}
-
-TEST(Tokenizer, StripOnlyWhenAsked) {
-    const zkStringBase source(" a , b ");
-    EXPECT_EQ((Tokens{"a", "b"}), tokens(source, kComma, true));
-    EXPECT_EQ((Tokens{" a ", " b "}), tokens(source, kComma, false));
-    EXPECT_EQ((Tokens{"", "x y", ""}), tokens(zkStringBase(" \t;\tx y\n;\r"), zkStringBase(";"), true));
-}
-
-TEST(Tokenizer, SeparatorSetsAndZeroBytes) {
-    EXPECT_EQ((Tokens{"k", "v", "w"}), tokens(zkStringBase("k=v;w"), zkStringBase("=;")));
-    EXPECT_EQ((Tokens{"a", "b"}), tokens(zkStringBase("a\0b", 3), zkStringBase("\0", 1)));
-    EXPECT_EQ((Tokens{std::string("a\0b", 3)}), tokens(zkStringBase("a\0b", 3), kComma));
-    EXPECT_EQ((Tokens{"a,b"}), tokens(zkStringBase("a,b"), zkStringBase()));
-}
-
-TEST(Tokenizer, FalseLeavesTheLastToken) {
-    zkStringBase token("kept");
-    zkBStringTokenizer none(zkStringBase::NullStr, kComma, true);
-    EXPECT_FALSE(none.GetNext(token));
-    EXPECT_EQ("kept", text(token));
-
-    const zkStringBase source("first,second");
-    zkBStringTokenizer tok(source, kComma, false);
-    ASSERT_TRUE(tok.GetNext(token));
-    ASSERT_TRUE(tok.GetNext(token));
-    EXPECT_FALSE(tok.GetNext(token));
-    EXPECT_FALSE(tok.GetNext(token));
-    EXPECT_EQ("second", text(token));
-}
-
-TEST(Tokenizer, ReadsSourceAndSeparatorsAtEachCall) {
-    zkStringBase source("a,b;c");
-    zkStringBase seps(",");
+    // The source and the separators are read at each call; false leaves the
+    // token alone. A source cut below the position gives one empty token more.
+    zkStringBase source("a,b;c;d"), seps(","), token;
     zkBStringTokenizer tok(source, seps, false);
-    zkStringBase token;
-    ASSERT_TRUE(tok.GetNext(token));
+    EXPECT_TRUE(tok.GetNext(token) && text(token) == "a");
     seps = ";";
-    ASSERT_TRUE(tok.GetNext(token));
-    EXPECT_EQ("b", text(token));
-    source.append(";d");
-    ASSERT_TRUE(tok.GetNext(token));
-    ASSERT_TRUE(tok.GetNext(token));
-    EXPECT_EQ("d", text(token));
-    EXPECT_FALSE(tok.GetNext(token));
-
-    // A source cut below the position hands out one empty token, then stops.
-    zkStringBase shrinking("abc,def");
-    zkBStringTokenizer cut(shrinking, kComma, false);
-    ASSERT_TRUE(cut.GetNext(token));
-    shrinking.cut(5);
-    EXPECT_TRUE(cut.GetNext(token));
-    EXPECT_EQ("", text(token));
-    EXPECT_FALSE(cut.GetNext(token));
+    EXPECT_TRUE(tok.GetNext(token) && text(token) == "b");
+    source.cut(3);
+    EXPECT_TRUE(tok.GetNext(token) && text(token).empty());
+    token = "kept";
+    EXPECT_FALSE(tok.GetNext(token) || tok.GetNext(token));
+    EXPECT_EQ("kept", text(token));
 }

@@ -3,234 +3,115 @@
 
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <string>
+#include <tuple>
 
 namespace {
 
 constexpr unsigned Bad = zkStringBase::BadIndex;
+constexpr auto kFolded = zkStringBase::CaseInsensitive;
+const char* const kNull = nullptr;
 
-// The bytes of s, after checking that the terminator is in place.
-std::string bytes(const zkStringBase& s) {
-    EXPECT_EQ('\0', s.data()[s.length()]);
-    return std::string(s.data(), s.length());
-}
-
-zkStringBase folded(const char* text) {
-    zkStringBase s(text);
-    s.setCompareType(zkStringBase::CaseInsensitive);
+zkStringBase str(const std::string& text, zkStringBase::CompareType type = zkStringBase::CaseSensitive) {
+    zkStringBase s(text.data(), static_cast<unsigned>(text.size()));
+    s.setCompareType(type);
     return s;
 }
 
-// One call of a field cutter: the source, the range, the flag, what out held
-// before, and the expected result and out afterwards.
-struct Cut {
-    const char* source;
-    unsigned from, to;
-    int clearOnFail;
-    const char* before;
-    unsigned result;
-    const char* after;
-};
+std::string text(const zkStringBase& s) { return std::string(s.data(), s.length()); }
 
 }  // namespace
 
-TEST(StringCompare, ExactGivesOneStepOnUnsignedBytes) {
-    const zkStringBase abc("abc");
-    EXPECT_EQ(-1, abc.compareTo(zkStringBase("abd"), true));
-    EXPECT_EQ(1, abc.compareTo(zkStringBase("ab"), true));
-    EXPECT_EQ(-1, zkStringBase("ab").compareTo(abc, true));
-    EXPECT_EQ(0, abc.compareTo(zkStringBase("abc"), true));
-    EXPECT_EQ(-1, zkStringBase("a").compareTo("z", true));
-    EXPECT_EQ(1, abc.compareTo("ABC", true));
-    EXPECT_EQ(1, zkStringBase("\xff").compareTo("a", true));
-    EXPECT_EQ(-1, zkStringBase("a\0b", 3).compareTo(zkStringBase("a\0c", 3), true));
-    EXPECT_EQ(0, zkStringBase("ab").compareTo("ab\0c", true));
-}
-
-TEST(StringCompare, FoldedGivesDifferenceOfFoldedBytes) {
-    EXPECT_EQ(0, zkStringBase("ABC").compareTo(zkStringBase("abc"), false));
-    EXPECT_EQ(-4, zkStringBase("a").compareTo(zkStringBase("e"), false));
-    EXPECT_EQ(4, zkStringBase("e").compareTo("A", false));
-    EXPECT_EQ(-1, zkStringBase("ab").compareTo("ABC", false));
-    EXPECT_EQ(-1, zkStringBase("a\0b", 3).compareTo(zkStringBase("A\0C", 3), false));
-
-    EXPECT_EQ(0, zkStringBase::imemcmp("abc", "ABD", 0));
-    EXPECT_EQ(0, zkStringBase::imemcmp("abc", "ABD", 2));
-    EXPECT_EQ('C' - 'D', zkStringBase::imemcmp("abc", "ABD", 3));
-    EXPECT_EQ('[' - 'A', zkStringBase::imemcmp("[", "a", 1));
-}
-
-TEST(StringCompare, EqualsOrderingAndStaticHelpers) {
-    const zkStringBase abc("abc");
-    EXPECT_FALSE(abc.equals(zkStringBase("abcd"), true));
-    EXPECT_FALSE(abc.equals("ab", false));
-    EXPECT_FALSE(abc.equals("ABC", true));
-    EXPECT_TRUE(abc.equals("ABC", false));
-    EXPECT_FALSE(zkStringBase("a\0b", 3).equals(zkStringBase("a\0c", 3), true));
-    EXPECT_FALSE(zkStringBase("ab\0", 3).equals("ab", true));
-
-    const zkStringBase b("B");
-    EXPECT_FALSE(b.greaterThan("a", true));
-    EXPECT_TRUE(b.greaterThan("a", false));
-    EXPECT_TRUE(b.lessThan(zkStringBase("a"), true));
-    EXPECT_FALSE(b.lessThan(zkStringBase("b"), false));
-
-    EXPECT_TRUE(zkStringBase::equalStrings("ABC", "abc", false));
-    EXPECT_FALSE(zkStringBase::equalStrings("ABC", "abc", true));
-    EXPECT_TRUE(zkStringBase::lessThanStrings("a", "e", true));
-    EXPECT_TRUE(zkStringBase::lessThanStrings("a", "e", false));
-    EXPECT_TRUE(zkStringBase::lessThanStrings("B", "a", true));
-    EXPECT_FALSE(zkStringBase::lessThanStrings("B", "a", false));
-    EXPECT_FALSE(zkStringBase::lessThanStrings("a", "A", false));
-}
-
-TEST(StringCompare, OperatorsFoldWhenEitherSideIsCaseInsensitive) {
-    const zkStringBase strict("abc");
-    EXPECT_TRUE(folded("Abc") == strict);
-    EXPECT_TRUE(strict == folded("Abc"));
-    EXPECT_FALSE(strict != folded("Abc"));
-    EXPECT_FALSE(zkStringBase("Abc") == strict);
-    EXPECT_TRUE(zkStringBase("Abc") != strict);
-
-    const zkStringBase lower("a");
-    EXPECT_TRUE(lower > zkStringBase("B"));
-    EXPECT_TRUE(lower < folded("B"));
-    EXPECT_TRUE(folded("B") > lower);
-    EXPECT_FALSE(folded("a") < zkStringBase("A"));
-
-    zkStringBase s("Abc");
-    EXPECT_FALSE(s == "abc");
-    EXPECT_TRUE(s != "abc");
-    s.setCompareType(zkStringBase::CaseInsensitive);
-    EXPECT_TRUE(s == "abc");
-    EXPECT_FALSE(s != "ABC");
-    EXPECT_TRUE(s < "abd");
-    EXPECT_TRUE(s > "ABB");
-    s.setCompareType(static_cast<zkStringBase::CompareType>(7));
-    EXPECT_FALSE(s == "abc");
-    EXPECT_TRUE(s == folded("abc"));
-
-    const char* none = nullptr;
-    for (const zkStringBase& t : {zkStringBase("x"), folded("x"), zkStringBase()}) {
-        EXPECT_FALSE(t == none);
-        EXPECT_FALSE(t != none);
-        EXPECT_FALSE(t < none);
-        EXPECT_FALSE(t > none);
-    }
-}
-
-TEST(StringSearch, FindCharAndText) {
-    const zkStringBase hello("hello");
-    EXPECT_EQ(2u, hello.find('l'));
-    EXPECT_EQ(3u, hello.find('l', 3));
-    EXPECT_EQ(Bad, hello.find('h', 1));
-    EXPECT_EQ(Bad, hello.find('o', 5));
-    EXPECT_EQ(2u, hello.find('L', 0, false));
-    EXPECT_EQ(Bad, hello.find('L', 0, true));
-
-    EXPECT_EQ(3u, hello.find("lo", 0, 0, true));
-    EXPECT_EQ(Bad, hello.find("lo", 4, 0, true));
-    EXPECT_EQ(4u, hello.find("o", 4, 0, true));
-    EXPECT_EQ(3u, hello.find("LO", 0, 0, false));
-    EXPECT_EQ(Bad, hello.find("LO", 0, 0, true));
-    EXPECT_EQ(1u, zkStringBase("xHeLLo").find("hello", 0, 0, false));
-    EXPECT_EQ(Bad, hello.find("l", 5, 0, true));
-    EXPECT_EQ(Bad, hello.find("hello!", 0, 0, true));
-    EXPECT_EQ(Bad, hello.find("llo", 3, 0, true));
-    EXPECT_EQ(3u, hello.find("lox", 0, 2, true));
-    EXPECT_EQ(0u, hello.find(hello));
-    EXPECT_EQ(Bad, hello.find("", 0, 0, true));
-    EXPECT_EQ(3u, zkStringBase("a\0b\0c", 5).find(zkStringBase("\0c", 2)));
-}
-
-TEST(StringSearch, RfindFromEndOrStart) {
-    const zkStringBase s("abxab");
-    EXPECT_EQ(3u, s.rfind(zkStringBase("ab")));
-    EXPECT_EQ(0u, s.rfind("ab", 2, 0, true));
-    EXPECT_EQ(3u, s.rfind("ab", 4, 0, true));
-    EXPECT_EQ(Bad, s.rfind("ab", 5, 0, true));
-    EXPECT_EQ(3u, s.rfind("AB", Bad, 0, false));
-    EXPECT_EQ(Bad, s.rfind("AB", Bad, 0, true));
-    EXPECT_EQ(2u, s.rfind("xz", Bad, 1, true));
-    EXPECT_EQ(0u, s.rfind("abxab", Bad, 0, true));
-    EXPECT_EQ(Bad, s.rfind("abxabc", Bad, 0, true));
-    EXPECT_EQ(Bad, s.rfind("", Bad, 0, true));
-
-    EXPECT_EQ(3u, s.rfind('a'));
-    EXPECT_EQ(0u, s.rfind('a', 2));
-    EXPECT_EQ(Bad, s.rfind('b', 0));
-    EXPECT_EQ(Bad, s.rfind('a', 5));
-    EXPECT_EQ(3u, s.rfind('A', Bad, false));
-
-    for (unsigned start : {0u, 1u, Bad}) {
-        EXPECT_EQ(Bad, zkStringBase().rfind("a", start, 0, true));
-        EXPECT_EQ(Bad, zkStringBase().rfind('a', start));
-    }
-}
-
-TEST(StringSearch, FindFirstOfReachesTheLastByte) {
-    const zkStringBase line("ab\r\n");
-    EXPECT_EQ(2u, line.findFirstOf("\r\n", 0, 0, true));
-    EXPECT_EQ(3u, line.findFirstOf("\r\n", 3, 0, true));
-    EXPECT_EQ(Bad, line.findFirstOf("\r\n", 4, 0, true));
-    EXPECT_EQ(Bad, line.findFirstOf("", 0, 0, true));
-    EXPECT_EQ(1u, line.findFirstOf("XB", 0, 0, false));
-    EXPECT_EQ(Bad, line.findFirstOf("XB", 0, 0, true));
-    EXPECT_EQ(Bad, zkStringBase("ab\n").findFirstOf("\r\n", 0, 1, true));
-    EXPECT_EQ(1u, zkStringBase("a\0b", 3).findFirstOf(zkStringBase("\0", 1)));
-}
-
-TEST(StringCut, SubStringRanges) {
-    const zkStringBase hello = folded("hello");
-    EXPECT_EQ("ell", bytes(hello.subString(1, 3)));
-    EXPECT_EQ("ello", bytes(hello.subString(1, Bad)));
-    EXPECT_EQ("h", bytes(hello.subString(0, 0)));
-    EXPECT_EQ("", bytes(hello.subString(3, 1)));
-    EXPECT_EQ("", bytes(hello.subString(5, 9)));
-    EXPECT_EQ("", bytes(zkStringBase().subString(0, Bad)));
-    const zkStringBase all = hello.subString(0, Bad);
-    EXPECT_EQ(zkStringBase::CaseSensitive, all.getCompareType());
-    EXPECT_GE(all.capacity(), all.length() + 1);
-    EXPECT_EQ(std::string("\0b", 2), bytes(zkStringBase("a\0bc", 4).subString(1, 2)));
-}
-
-TEST(StringCut, FieldCutterAppendsUpToTheSeparator) {
-    const Cut cuts[] = {
-        {"a,bc", 0, Bad, 0, "X", 1, "Xa"},     {"a,bc", 2, Bad, 0, "", Bad, "bc"},
-        {"a,bc", 2, Bad, 1, "k", Bad, ""},     {"a,bc", 1, Bad, 1, "k", 1, "k"},
-        {"a,bc", 0, 0, 0, "", Bad, "a"},       {"a,bc", 4, Bad, 0, "k", Bad, "k"},
-        {"a,bc", Bad, Bad, 0, "k", Bad, "k"},  {"a,bc", 3, 2, 2, "k", Bad, ""},
-        {"", 0, Bad, 0, "k", Bad, "k"},        {"", 0, Bad, 1, "k", Bad, ""},
-        {"x,,yz", 2, Bad, 1, "", 2, ""},       {"x,,yz", 3, 99, 0, "", Bad, "yz"},
+// Exact: -1 or +1 at the first differing unsigned byte; folded: the
+// difference of the upper-cased bytes; on an equal prefix the shorter first.
+TEST(StringCompare, NamedComparisonsAndOperatorsAgree) {
+    const struct { std::string a, b; bool exact; short order; } cases[] = {
+        {"abc", "abd", true, -1},  {"abc", "ab", true, 1},   {"ab", "abc", true, -1},
+        {"abc", "abc", true, 0},   {"abc", "ABC", true, 1},  {"\xff", "a", true, 1},
+        {{"ab\0", 3}, "ab", true, 1}, {{"a\0b", 3}, {"a\0c", 3}, true, -1},
+        {"ABC", "abc", false, 0},  {"a", "e", false, -4},    {"e", "A", false, 4},
+        {"ab", "ABC", false, -1},  {"[", "a", false, '[' - 'A'}, {{"a\0b", 3}, {"A\0C", 3}, false, -1},
     };
-    for (const Cut& c : cuts) {
-        zkStringBase out(c.before);
-        EXPECT_EQ(c.result, zkStringBase(c.source).subString(',', out, c.from, c.to, c.clearOnFail))
-            << c.source << " from " << c.from;
-        EXPECT_EQ(c.after, bytes(out)) << c.source << " from " << c.from;
+    for (const auto& c : cases) {
+        const zkStringBase a = str(c.a), b = str(c.b);
+        const auto all = [&](const auto& other) {
+            return std::make_tuple(a.compareTo(other, c.exact), a.equals(other, c.exact), a.lessThan(other, c.exact),
+                                   a.greaterThan(other, c.exact));
+        };
+        const auto expected = std::make_tuple(c.order, c.order == 0, c.order < 0, c.order > 0);
+        EXPECT_EQ(expected, all(b)) << c.a << " " << c.b;
+        EXPECT_TRUE(std::strlen(b.data()) != b.length() || expected == all(b.data())) << c.a << " " << c.b;
     }
+    EXPECT_TRUE(zkStringBase::imemcmp("abc", "ABD", 3) == 'C' - 'D' && zkStringBase::imemcmp("abc", "ABD", 2) == 0);
+    EXPECT_FALSE(zkStringBase::lessThanStrings("a", "A", false) || zkStringBase::equalStrings("B", "b", true));
+
+    // Operators between strings compare exactly only when both are
+    // case-sensitive, any non-zero compare type counting as such; a null text
+    // makes every operator false.
+    const zkStringBase seven = str("Abc", static_cast<zkStringBase::CompareType>(7)), none;
+    EXPECT_TRUE(str("Abc", kFolded) == str("abc") && str("abc") == str("Abc", kFolded) && seven == str("abc", kFolded));
+    EXPECT_FALSE(str("Abc") == str("abc") || str("abc") != str("Abc", kFolded) || seven == "abc");
+    EXPECT_TRUE(str("a") > str("B") && str("a") < str("B", kFolded) && str("B", kFolded) > str("a"));
+    EXPECT_TRUE(str("Abc") != "abc" && str("Abc", kFolded) == "abc" && str("Abc", kFolded) < "abd");
+    EXPECT_FALSE(str("Abc", kFolded) != "ABC" || str("a", kFolded) < "A");
+    for (const zkStringBase& t : {str("x"), str("x", kFolded), none})
+        EXPECT_FALSE(t == kNull || t != kNull || t < kNull || t > kNull);
 }
 
-TEST(StringCut, SeparatorSetCutter) {
-    const Cut cuts[] = {
-        {"a;b,c", 0, Bad, 0, "", 1, "a"},      {"a;b,c", 2, Bad, 0, "=", 3, "=b"},
-        {"a;b,c", 4, Bad, 0, "", Bad, "c"},    {"a;b,c", 4, Bad, 1, "k", Bad, ""},
-        {"a,b", 2, Bad, 0, "", Bad, "b"},      {"a;b,c", 1, 1, 1, "", 1, ""},
-        {"a;b,c", 2, 2, 0, "", Bad, "b"},      {"a;b,c", 3, 2, 1, "k", Bad, ""},
-        {"", 0, Bad, 0, "k", Bad, "k"},        {"", 0, Bad, 1, "k", Bad, ""},
+TEST(StringSearch, FindRfindAndFindFirstOfBoundaries) {
+    const zkStringBase hello("hello"), s("abxab"), line("ab\r\n"), empty;
+    const unsigned found[][2] = {
+        {hello.find('l', 3), 3}, {hello.find('h', 1), Bad}, {hello.find('o', 4), 4}, {hello.find('o', 5), Bad},
+        {hello.find('L', 0, false), 2}, {hello.find('L', 0, true), Bad}, {hello.find("lo", 0, 0, true), 3},
+        {hello.find("lo", 4, 0, true), Bad}, {hello.find("o", 4, 0, true), 4}, {hello.find("LO", 0, 0, false), 3},
+        {hello.find("LO", 0, 0, true), Bad}, {hello.find("", 0, 0, true), Bad},
+        {str("xHeLLo").find("hello", 0, 0, false), 1}, {hello.find("hello!", 0, 0, true), Bad},
+        {hello.find("lox", 0, 2, true), 3}, {str({"a\0b\0c", 5}).find(str({"\0c", 2})), 3},
+        {s.rfind(zkStringBase("ab")), 3}, {s.rfind("ab", 2, 0, true), 0}, {s.rfind("ab", 5, 0, true), Bad},
+        {s.rfind("AB", Bad, 0, false), 3}, {s.rfind("AB", Bad, 0, true), Bad}, {s.rfind("xz", Bad, 1, true), 2},
+        {s.rfind("abxab", Bad, 0, true), 0}, {s.rfind("abxabc", Bad, 0, true), Bad}, {s.rfind("", Bad, 0, true), Bad},
+        {s.rfind('b'), 4}, {s.rfind('a', 2), 0}, {s.rfind('b', 0), Bad}, {s.rfind('a', 5), Bad},
+        {s.rfind('A', Bad, false), 3}, {empty.rfind('a'), Bad}, {empty.rfind("a", Bad, 0, true), Bad},
+        {line.findFirstOf("\r\n", 0, 0, true), 2}, {line.findFirstOf("\n", 3, 0, true), 3},
+        {line.findFirstOf("\r\n", 4, 0, true), Bad}, {line.findFirstOf("", 0, 0, true), Bad},
+        {line.findFirstOf("XB", 0, 0, false), 1}, {line.findFirstOf("X\n", 2, 0, false), 3},
+        {line.findFirstOf("XB\n", 0, 0, true), 3}, {str("ab\n").findFirstOf("\r\n", 0, 1, true), Bad},
+        {str({"a\0b", 3}).findFirstOf(str({"\0", 1})), 1},
     };
-    const zkStringBase seps(",;");
-    for (const Cut& c : cuts) {
-        zkStringBase out(c.before);
-        EXPECT_EQ(c.result, zkStringBase(c.source).subString(seps, out, c.from, c.to, c.clearOnFail))
-            << c.source << " from " << c.from;
-        EXPECT_EQ(c.after, bytes(out)) << c.source << " from " << c.from;
-    }
+    for (const auto& row : found) EXPECT_EQ(row[1], row[0]) << "row " << &row - found;
+}
 
-    zkStringBase out;
-    EXPECT_EQ(Bad, zkStringBase("a;b").subString(zkStringBase(), out, 0, Bad, 0));
-    EXPECT_EQ("a;b", bytes(out));
-    out.makeNull();
-    EXPECT_EQ(1u, zkStringBase("a\0b", 3).subString(zkStringBase("\0", 1), out, 0, Bad, 0));
-    EXPECT_EQ("a", bytes(out));
+// subString(from, to) makes a new case-sensitive string; a field cutter
+// appends up to the first separator within the range and returns its
+// position, else BadIndex, and a non-zero clearOnFail then empties out.
+TEST(StringCut, SubStringAndFieldCutters) {
+    const zkStringBase hello = str("hello", kFolded);
+    EXPECT_EQ(zkStringBase::CaseSensitive, hello.subString(0, Bad).getCompareType());
+    const std::pair<zkStringBase, std::string> subs[] = {
+        {hello.subString(1, 3), "ell"}, {hello.subString(1, Bad), "ello"}, {hello.subString(0, 0), "h"},
+        {hello.subString(3, 1), ""},    {hello.subString(5, 9), ""},
+        {str({"a\0bc", 4}).subString(1, 2), {"\0b", 2}},
+    };
+    for (const auto& sub : subs) EXPECT_EQ(sub.second, text(sub.first));
+
+    const struct { std::string source, seps; unsigned from, to; int clear; const char* before; unsigned result;
+                   std::string after; } cuts[] = {
+        {"a,bc", ",", 0, Bad, 0, "X", 1, "Xa"},     {"a,bc", ",", 2, Bad, 0, "", Bad, "bc"},
+        {"a,bc", ",", 2, Bad, 1, "k", Bad, ""},     {"a,bc", ",", 1, Bad, 1, "k", 1, "k"},
+        {"a,bc", ",", 0, 0, 0, "", Bad, "a"},       {"a,bc", ",", 4, Bad, 0, "k", Bad, "k"},
+        {"a,bc", ",", Bad, Bad, 0, "k", Bad, "k"},  {"a,bc", ",", 3, 2, 2, "k", Bad, ""},
+        {"", ",", 0, Bad, 1, "k", Bad, ""},         {"x,,yz", ",", 3, 99, 0, "", Bad, "yz"},
+        {"a;b,c", ",;", 2, Bad, 0, "=", 3, "=b"},   {"a;b,c", ",;", 4, Bad, 0, "", Bad, "c"},
+        {"a;b,c", ",;", 1, 1, 1, "", 1, ""},        {"a;b,c", ",;", 2, 2, 0, "", Bad, "b"},
+        {"a;b", "", 0, Bad, 0, "", Bad, "a;b"},     {{"a\0b", 3}, {"\0", 1}, 0, Bad, 0, "", 1, "a"},
+    };
+    for (const auto& c : cuts) {
+        const zkStringBase source = str(c.source);
+        zkStringBase out(c.before);
+        const unsigned result = c.seps.size() == 1 ? source.subString(c.seps[0], out, c.from, c.to, c.clear)
+                                                   : source.subString(str(c.seps), out, c.from, c.to, c.clear);
+        EXPECT_EQ(c.result, result) << c.source << " from " << c.from;
+        EXPECT_EQ(c.after, text(out)) << c.source << " from " << c.from;
+    }
 }
