@@ -80,14 +80,11 @@ TEST(FileManagerCopy, FailedCopyKeepsTheSourceAndLeavesNoPartialDestination) {
 
     // Both loops stop at a write error and remove what they wrote; the file
     // being overwritten keeps its old content.
-    rlimit saved;
-    ASSERT_EQ(0, getrlimit(RLIMIT_FSIZE, &saved));
-    const rlimit limit = {big.size() / 2, saved.rlim_max};
-    const sighandler_t handler = signal(SIGXFSZ, SIG_IGN);
-    ASSERT_EQ(0, setrlimit(RLIMIT_FSIZE, &limit));
-    const int results[] = {copyFile(a, dir.file("moved"), 0, 0, 1), copyFile(fromMemory, dir.file("m"), 0, 1)};
-    setrlimit(RLIMIT_FSIZE, &saved);
-    signal(SIGXFSZ, handler);
+    int results[2] = {0, 0};
+    ASSERT_TRUE(zkWithFileSizeLimit(big.size() / 2, [&] {
+        results[0] = copyFile(a, dir.file("moved"), 0, 0, 1);
+        results[1] = copyFile(fromMemory, dir.file("m"), 0, 1);
+    }));
     close(memory);
     EXPECT_TRUE(results[0] == 1 && results[1] == 1);
     EXPECT_EQ("a.txt=" + big + " m=" + big + " ", tree(dir.path()));

@@ -19,33 +19,10 @@
 
 namespace {
 
-std::set<std::string> entries(const std::string& path) {
-    std::set<std::string> names;
-    DIR* dir = opendir(path.c_str());
-    while (const dirent* entry = dir ? readdir(dir) : nullptr) names.insert(entry->d_name);
-    if (dir) closedir(dir);
-    names.erase(".");
-    names.erase("..");
-    return names;
-}
-
 int copyFile(const std::string& from, const std::string& to, unsigned recursive, unsigned overwrite,
              unsigned deleteSource) {
     zkStringBase source(from.c_str()), destination(to.c_str());
     return zkFileManager::CopyFile(source, destination, recursive, 0, overwrite, 0, deleteSource, nullptr, nullptr);
-}
-
-// Runs body with writes past `bytes` failing with EFBIG instead of a signal.
-template <class Body>
-void withFileSizeLimit(rlim_t bytes, Body body) {
-    struct rlimit saved;
-    ASSERT_EQ(0, getrlimit(RLIMIT_FSIZE, &saved));
-    const struct rlimit limit = {bytes, saved.rlim_max};
-    const sighandler_t handler = signal(SIGXFSZ, SIG_IGN);
-    ASSERT_EQ(0, setrlimit(RLIMIT_FSIZE, &limit));
-    body();
-    setrlimit(RLIMIT_FSIZE, &saved);
-    signal(SIGXFSZ, handler);
 }
 
 // Makes a chain of `depth` folders named "d" below path, working from the
@@ -66,7 +43,7 @@ void removeBelow(const std::string& path) {
     if (chdir(path.c_str()) == 0) {
         for (;;) {
             std::string next;
-            for (const std::string& name : entries(".")) {
+            for (const std::string& name : zkDirEntries(".")) {
                 struct stat st;
                 if (lstat(name.c_str(), &st) == 0 && S_ISDIR(st.st_mode) && rmdir(name.c_str()) != 0) next = name;
                 else if (!S_ISDIR(st.st_mode)) unlink(name.c_str());
@@ -95,28 +72,28 @@ TEST(FileFault, CopyUnderAFileSizeLimitAtEveryOffsetLeavesNoPartialFile) {
     const std::string old = dir.file("old.bin");
     ASSERT_TRUE(zkWriteFile(old, "old"));
     ASSERT_EQ(0, chmod(old.c_str(), 0640));
-    const std::set<std::string> before = entries(dir.path());
+    const std::set<std::string> before = zkDirEntries(dir.path());
 
     // Every offset near the ends and the block boundaries, a stride between.
     for (size_t limit = 0; limit < bytes.size(); limit += limit < 16 || limit + 16 > bytes.size() ? 1 : 61) {
         int copied = 0, moved = 0, overwritten = 0;
-        withFileSizeLimit(limit, [&] {
+        ASSERT_TRUE(zkWithFileSizeLimit(limit, [&] {
             copied = copyFile(source, destination, 0, 0, 0);
             moved = copyFile(source, dir.file("moved.bin"), 0, 0, 1);
             overwritten = copyFile(source, old, 0, 1, 0);
-        });
+        }));
         ASSERT_NE(0, copied) << limit;
         ASSERT_NE(0, moved) << limit;
         ASSERT_NE(0, overwritten) << limit;
         ASSERT_EQ(bytes, zkReadFile(source)) << limit;
         ASSERT_EQ("old", zkReadFile(old)) << limit;
-        ASSERT_EQ(before, entries(dir.path())) << limit;
+        ASSERT_EQ(before, zkDirEntries(dir.path())) << limit;
     }
     int copied = 1, overwritten = 1;
-    withFileSizeLimit(bytes.size(), [&] {
+    ASSERT_TRUE(zkWithFileSizeLimit(bytes.size(), [&] {
         copied = copyFile(source, destination, 0, 0, 0);
         overwritten = copyFile(source, old, 0, 1, 0);
-    });
+    }));
     EXPECT_EQ(0, copied);
     EXPECT_EQ(bytes, zkReadFile(destination));
     EXPECT_EQ(0, overwritten);
@@ -142,10 +119,10 @@ TEST(FileFault, BasicFileWritesThatFailGiveFailureResults) {
     zkBasicFile limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
     ASSERT_EQ(0, limited.Open());
     int first = 1, second = 0;
-    withFileSizeLimit(2, [&] {
+    ASSERT_TRUE(zkWithFileSizeLimit(2, [&] {
         first = limited.Write("abc", 3, &count);
         second = limited.Write("d", 1, nullptr);
-    });
+    }));
     EXPECT_EQ(0, first);  // a short write
     EXPECT_EQ(2u, count);
     EXPECT_EQ(1, second);
@@ -173,9 +150,9 @@ TEST(FileFault, TreesDeeperThanAnyPathAreListedAndCopiedWithoutCrashing) {
 
     // Paths past the system's limit cannot be copied: the copy says so.
     EXPECT_NE(0, copyFile(dir.file("deep"), dir.file("copy"), 1, 0, 0));
-    EXPECT_EQ(1u, entries(dir.file("deep")).size());
+    EXPECT_EQ(1u, zkDirEntries(dir.file("deep")).size());
     removeBelow(dir.path());
-    EXPECT_TRUE(entries(dir.path()).empty());
+    EXPECT_TRUE(zkDirEntries(dir.path()).empty());
 }
 
 TEST(FileFault, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
@@ -190,8 +167,8 @@ TEST(FileFault, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
     EXPECT_EQ(0, zkFileManager::CreateDirectory("", nullptr));
     ASSERT_EQ(0, fchdir(home));
     close(home);
-    EXPECT_EQ((std::set<std::string>{"b", "x"}), entries(dir.file("a")));
-    EXPECT_EQ((std::set<std::string>{"c"}), entries(dir.file("a/b")));
-    EXPECT_EQ((std::set<std::string>{"y"}), entries(dir.file("a/x")));
+    EXPECT_EQ((std::set<std::string>{"b", "x"}), zkDirEntries(dir.file("a")));
+    EXPECT_EQ((std::set<std::string>{"c"}), zkDirEntries(dir.file("a/b")));
+    EXPECT_EQ((std::set<std::string>{"y"}), zkDirEntries(dir.file("a/x")));
     EXPECT_EQ("x", zkReadFile(dir.file("plain")));
 }

@@ -16,27 +16,6 @@
 
 namespace {
 
-size_t entryCount(const std::string& path) {
-    size_t n = 0;
-    DIR* dir = opendir(path.c_str());
-    while (const dirent* entry = dir ? readdir(dir) : nullptr) n += entry->d_name[0] != '.';
-    if (dir) closedir(dir);
-    return n;
-}
-
-// Runs body with writes past `bytes` failing with EFBIG instead of a signal.
-template <class Body>
-void withFileSizeLimit(rlim_t bytes, Body body) {
-    struct rlimit saved;
-    ASSERT_EQ(0, getrlimit(RLIMIT_FSIZE, &saved));
-    const struct rlimit limit = {bytes, saved.rlim_max};
-    const sighandler_t handler = signal(SIGXFSZ, SIG_IGN);
-    ASSERT_EQ(0, setrlimit(RLIMIT_FSIZE, &limit));
-    body();
-    setrlimit(RLIMIT_FSIZE, &saved);
-    signal(SIGXFSZ, handler);
-}
-
 // A document of several sections, written with one write per section.
 std::string versionText(char tag, int sections) {
     std::string text;
@@ -64,14 +43,14 @@ TEST(IniFault, FileSizeLimitAtEveryOffsetKeepsTheOldFile) {
 
     for (size_t limit = 0; limit < text.size(); ++limit) {
         int result = 0;
-        withFileSizeLimit(limit, [&] { result = ini.Close(1); });
+        ASSERT_TRUE(zkWithFileSizeLimit(limit, [&] { result = ini.Close(1); }));
         ASSERT_EQ(1, result) << limit;
         ASSERT_EQ(old, zkReadFile(path)) << limit;
-        ASSERT_EQ(1u, entryCount(dir.path())) << limit;
+        ASSERT_EQ(1u, zkDirEntries(dir.path()).size()) << limit;
         ASSERT_EQ(kept, zkDump(ini)) << limit;
     }
     int result = 1;
-    withFileSizeLimit(text.size(), [&] { result = ini.Close(1); });
+    ASSERT_TRUE(zkWithFileSizeLimit(text.size(), [&] { result = ini.Close(1); }));
     EXPECT_EQ(0, result);
     EXPECT_EQ(text, zkReadFile(path));
 }
@@ -123,7 +102,7 @@ TEST(IniFault, ConcurrentSaversAndLoadersSeeWholeDocuments) {
         ASSERT_EQ(pid, waitpid(pid, &status, 0));
         EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << status;
     }
-    EXPECT_EQ(4u, entryCount(dir.path()));  // the shared file and three sources
+    EXPECT_EQ(4u, zkDirEntries(dir.path()).size());  // the shared file and three sources
 }
 
 TEST(IniFault, HugeNulAndOneCharacterLinesRoundTrip) {

@@ -15,16 +15,6 @@
 
 namespace {
 
-// The names in a directory, "." and ".." left out.
-std::set<std::string> entries(const std::string& path) {
-    std::set<std::string> names;
-    DIR* dir = opendir(path.c_str());
-    while (const dirent* entry = dir ? readdir(dir) : nullptr) names.insert(entry->d_name);
-    if (dir) closedir(dir);
-    for (const char* dots : {".", ".."}) names.erase(dots);
-    return names;
-}
-
 struct stat statOf(const std::string& path) {
     struct stat st = {};
     EXPECT_EQ(0, lstat(path.c_str(), &st)) << path;
@@ -61,7 +51,7 @@ TEST(IniSave, WrittenForms) {
     ini.SetVal(name, zkStr("10.0.0.9"), zkStr(""));
     EXPECT_EQ(0, ini.CloseFW(1));
     EXPECT_EQ("[s]\nk=\n\n[IPSBEHINDFIREWALL]\n10.0.0.9\n\n", zkReadFile(path));
-    EXPECT_EQ((std::set<std::string>{"a.ini"}), entries(dir.path()));
+    EXPECT_EQ((std::set<std::string>{"a.ini"}), zkDirEntries(dir.path()));
 }
 
 // Through a link the target is replaced and the link stays, also when the
@@ -92,7 +82,7 @@ TEST(IniSave, KeepsPermissionsOwnerAndLinks) {
     EXPECT_EQ("[d]\nk=v\n\n", zkReadFile(dir.file("b.ini")));
     EXPECT_EQ(0640u, statOf(dir.file("b.ini")).st_mode & 07777);
     EXPECT_TRUE(S_ISLNK(statOf(dir.file("link.ini")).st_mode) && S_ISLNK(statOf(dir.file("dangling.ini")).st_mode));
-    EXPECT_EQ((std::set<std::string>{"a.ini", "link.ini", "dangling.ini", "b.ini", "sub"}), entries(dir.path()));
+    EXPECT_EQ((std::set<std::string>{"a.ini", "link.ini", "dangling.ini", "b.ini", "sub"}), zkDirEntries(dir.path()));
 }
 
 // No directory to write into, no name, a write past the file size limit, or
@@ -123,7 +113,7 @@ TEST(IniSave, FailedSavesKeepTheFileAndTheDocument) {
         EXPECT_TRUE(closed == 1 && closedFW == 1) << c.file << c.section << c.key << c.value.size();
         EXPECT_EQ(kept, zkDump(ini));
         EXPECT_EQ(old, zkReadFile(path));
-        EXPECT_EQ((std::set<std::string>{"a.ini"}), entries(dir.path()));
+        EXPECT_EQ((std::set<std::string>{"a.ini"}), zkDirEntries(dir.path()));
     }
     signal(SIGXFSZ, handler);
 }
@@ -154,7 +144,7 @@ TEST(IniSave, RewritesInPlaceWhenNoNewFileCanBeMade) {
     EXPECT_EQ("[s]\nk=new value\n\n", zkReadFile(path));
     EXPECT_EQ(0666u, statOf(path).st_mode & 07777);
     EXPECT_EQ("[s]\nk=locked\n\n", zkReadFile(locked));
-    EXPECT_EQ((std::set<std::string>{"a.ini", "locked.ini"}), entries(dir.path()));
+    EXPECT_EQ((std::set<std::string>{"a.ini", "locked.ini"}), zkDirEntries(dir.path()));
 
     // A device is written where it stands, never replaced by a regular file.
     struct stat st;
@@ -163,5 +153,5 @@ TEST(IniSave, RewritesInPlaceWhenNoNewFileCanBeMade) {
     other.SetFilename(dir.file("full.ini").c_str());
     EXPECT_EQ(1, other.Close(1));
     EXPECT_TRUE(S_ISCHR(statOf("/dev/full").st_mode));
-    EXPECT_EQ((std::set<std::string>{"a.ini", "locked.ini", "full.ini"}), entries(dir.path()));
+    EXPECT_EQ((std::set<std::string>{"a.ini", "locked.ini", "full.ini"}), zkDirEntries(dir.path()));
 }

@@ -1,15 +1,20 @@
-// Test helpers: a temporary directory that removes itself, and whole-file
-// reads and writes for comparing exact bytes.
+// Test helpers: a temporary directory that removes itself, whole-file reads
+// and writes for comparing exact bytes, directory listings, and a file size
+// limit for provoking failed writes.
 #ifndef ZK_TESTS_TEMP_DIR_H
 #define ZK_TESTS_TEMP_DIR_H
 
+#include <dirent.h>
 #include <ftw.h>
+#include <signal.h>
 #include <stdio.h>
+#include <sys/resource.h>
 #include <stdlib.h>
 #include <unistd.h>
 
 #include <fstream>
 #include <iterator>
+#include <set>
 #include <sstream>
 #include <string>
 
@@ -50,6 +55,33 @@ inline bool zkWriteFile(const std::string& path, const std::string& bytes) {
     std::ofstream out(path, std::ios::binary | std::ios::trunc);
     out << bytes;
     return static_cast<bool>(out.flush());
+}
+
+// The names in a directory, "." and ".." left out; empty when it cannot be read.
+inline std::set<std::string> zkDirEntries(const std::string& path) {
+    std::set<std::string> names;
+    DIR* dir = opendir(path.c_str());
+    while (const dirent* entry = dir ? readdir(dir) : nullptr) names.insert(entry->d_name);
+    if (dir) closedir(dir);
+    names.erase(".");
+    names.erase("..");
+    return names;
+}
+
+// Runs body with writes past `bytes` failing with EFBIG instead of raising
+// SIGXFSZ, then restores the limit and the signal's handling. False when the
+// limit could not be set (body then does not run).
+template <class Body>
+bool zkWithFileSizeLimit(unsigned long long bytes, Body body) {
+    struct rlimit saved;
+    if (getrlimit(RLIMIT_FSIZE, &saved) != 0) return false;
+    const struct rlimit limit = {static_cast<rlim_t>(bytes), saved.rlim_max};
+    const sighandler_t handler = signal(SIGXFSZ, SIG_IGN);
+    const bool set = setrlimit(RLIMIT_FSIZE, &limit) == 0;
+    if (set) body();
+    setrlimit(RLIMIT_FSIZE, &saved);
+    signal(SIGXFSZ, handler);
+    return set;
 }
 
 #endif
