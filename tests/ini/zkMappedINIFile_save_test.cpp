@@ -1,9 +1,6 @@
 // Saving INI documents: the written form, the firewall form, and replacing
 // the file safely (permissions, owner, links, failures, the in-place way).
-#include <dirent.h>
 #include <gtest/gtest.h>
-#include <signal.h>
-#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -96,26 +93,19 @@ TEST(IniSave, FailedSavesKeepTheFileAndTheDocument) {
         {dir.file("missing/a.ini"), "s", "k", "v"}, {"", "s", "k", "v"},     {path, "s", "k", std::string(4000, 'v')},
         {path, "s", "k", "a\nb"},                   {path, "s", "k\r", "v"}, {path, "x\ny", "k", "v"},
     };
-    struct rlimit saved;
-    ASSERT_EQ(0, getrlimit(RLIMIT_FSIZE, &saved));
-    const struct rlimit limit = {1024, saved.rlim_max};
-    const sighandler_t handler = signal(SIGXFSZ, SIG_IGN);
     for (const auto& c : cases) {
         zkMappedINIFile ini;
         ASSERT_EQ(0, zkLoad(ini, dir, "a.ini", old));
         ini.SetVal(zkStr(c.section), zkStr(c.key), zkStr(c.value.c_str()));
         const std::string kept = zkDump(ini);
         ini.SetFilename(c.file.c_str());
-        const int limited = setrlimit(RLIMIT_FSIZE, &limit);
-        const int closed = ini.Close(1), closedFW = ini.CloseFW(1);
-        setrlimit(RLIMIT_FSIZE, &saved);
-        ASSERT_EQ(0, limited);
+        int closed = 0, closedFW = 0;
+        ASSERT_TRUE(zkWithFileSizeLimit(1024, [&] { closed = ini.Close(1); closedFW = ini.CloseFW(1); }));
         EXPECT_TRUE(closed == 1 && closedFW == 1) << c.file << c.section << c.key << c.value.size();
         EXPECT_EQ(kept, zkDump(ini));
         EXPECT_EQ(old, zkReadFile(path));
         EXPECT_EQ((std::set<std::string>{"a.ini"}), zkDirEntries(dir.path()));
     }
-    signal(SIGXFSZ, handler);
 }
 
 // Where no new file can be made, a writable file is rewritten in place; a
