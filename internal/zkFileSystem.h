@@ -1,0 +1,61 @@
+// The library's one boundary to the operating system for writing files.
+//
+// Every write that replaces a user's file goes through zkReplaceFile; every
+// new file that a copy creates goes through zkCreateNewFile. Both take the
+// new contents from a writer callback that writes to the descriptor it is
+// given (through zkWriteAll or its own loop) and returns false on failure,
+// with errno set.
+//
+// Results follow one rule: 0 done, 1 failed with errno telling why (the
+// first failure's errno, kept across the cleanup that follows it).
+#ifndef ZK_FILE_SYSTEM_H
+#define ZK_FILE_SYSTEM_H
+
+#include <sys/types.h>
+
+#include <functional>
+#include <string>
+
+// Writes the new contents to the descriptor; false on failure, errno set.
+using zkContentWriter = std::function<bool(int fd)>;
+
+// Opens path with flags | O_CLOEXEC, retrying when interrupted; -1 on failure.
+int zkOpen(const char* path, int flags, mode_t mode);
+
+// Writes all size bytes, continuing after short and interrupted writes:
+// 0 written, 1 failed (a write that takes nothing fails with EIO).
+int zkWriteAll(int fd, const void* data, size_t size);
+
+// Follows path through symbolic links to the name of the file itself, which
+// may not exist yet: false (errno ELOOP, ENAMETOOLONG or the readlink error)
+// when the chain is too long or unreadable.
+bool zkResolveLinks(std::string& path);
+
+// Makes a durable record of renames in the directory of path; failures
+// only cost durability and are not reported.
+void zkSyncDirectoryOf(const std::string& path);
+
+// Replaces the contents of the file at path (through symbolic links: the
+// final target is replaced and the links stay) with what write produces.
+//
+// An existing regular file: the contents go to a new file beside it, made
+// exclusively with mode 0600 under a name that fits one path component,
+// given the old file's owner and group (where the process may) and then its
+// permission bits, set-id bits included, through the descriptor before any
+// byte is written; the new file is flushed, renamed over the old one and the
+// directory flushed. Where no file can be made or renamed beside it and the
+// process may write the old file, it is rewritten in place so that a
+// failure writes the old bytes back. sizeHint (0: unknown) is the size the
+// new contents will have; the in-place path reserves it before overwriting.
+// A missing file is made the same way with newMode (the umask applies).
+// Devices, FIFOs and other files that are not regular are written through.
+//
+// On failure the old file is as it was, byte for byte, and no temporary
+// file is left.
+int zkReplaceFile(const char* path, mode_t newMode, unsigned long long sizeHint, const zkContentWriter& write);
+
+// Creates path exclusively with mode (the umask applies), writes it through
+// write and flushes it when sync; on failure removes it again.
+int zkCreateNewFile(const char* path, mode_t mode, bool sync, const zkContentWriter& write);
+
+#endif
