@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "../internal/zkFileSystem.h"
+#include "../internal/zkPathRules.h"
 
 namespace {
 
@@ -24,7 +25,6 @@ constexpr unsigned kReadAccess = 0444;
 // A new copy's mode, less the umask and the bits its source lacks.
 constexpr mode_t kCreatedMode = 0664;
 
-constexpr char kSeparator = '/';
 constexpr const char* kAllEntries = "*";
 
 struct Options {
@@ -56,7 +56,7 @@ bool sameFile(const struct stat& a, const struct stat& b) {
 
 std::string asDirectory(const char* path) {
     std::string dir(path);
-    if (dir.empty() || dir.back() != kSeparator) dir += kSeparator;
+    if (dir.empty() || dir.back() != kZkPathSeparator) dir += kZkPathSeparator;
     return dir;
 }
 

@@ -6,9 +6,10 @@
 #include <cstring>
 #include <initializer_list>
 
+#include "../../internal/zkPathRules.h"
+
 namespace {
 
-constexpr char kSeparator = '/';
 constexpr const char* kSchemeMark = "://";
 constexpr const char* kDefaultProtocol = "file";
 
@@ -21,16 +22,6 @@ char* copyOf(const char* s, size_t n) {
     std::memcpy(copy, s, n);
     copy[n] = '\0';
     return copy;
-}
-
-// Where the extension's dot is in a final component of n bytes, or n when it
-// has none. A dot in front (.profile) or at the end (a.) starts no extension,
-// so that joining the parts again gives back the same text.
-size_t extensionDot(const char* name, size_t n) {
-    for (size_t i = n; i-- > 1;) {
-        if (name[i] == '.') return i + 1 < n ? i : n;
-    }
-    return n;
 }
 
 // Replaces an empty part by null, so that every empty part looks the same.
@@ -95,11 +86,11 @@ void zkFilename::split(const char* path) {
     if (path == nullptr || *path == '\0') return;
     size_t n = std::strlen(path);
     m_path = copyOf(path, n);
-    const char* slash = std::strrchr(path, kSeparator);
+    const char* slash = std::strrchr(path, kZkPathSeparator);
     const char* name = slash ? slash + 1 : path;
     if (slash) m_dir = copyOf(path, static_cast<size_t>(name - path));
     size_t nameLength = n - static_cast<size_t>(name - path);
-    size_t dot = extensionDot(name, nameLength);
+    size_t dot = zkExtensionDot(name, nameLength);
     m_fname = copyOf(name, dot);
     if (dot < nameLength) m_ext = copyOf(name + dot + 1, nameLength - dot - 1);
     dropIfEmpty(&m_fname);
@@ -108,14 +99,14 @@ void zkFilename::split(const char* path) {
 
 void zkFilename::Rebuild(int, int, int, int, int) {
     if (m_fname) {
-        const char* slash = std::strrchr(m_fname, kSeparator);
+        const char* slash = std::strrchr(m_fname, kZkPathSeparator);
         if (slash) {
             size_t moved = static_cast<size_t>(slash - m_fname) + 1;
             size_t dirLength = m_dir ? std::strlen(m_dir) : 0;
-            bool joint = dirLength && m_dir[dirLength - 1] != kSeparator;
+            bool joint = dirLength && m_dir[dirLength - 1] != kZkPathSeparator;
             char* dir = new char[dirLength + joint + moved + 1];
             std::memcpy(dir, text(m_dir), dirLength);
-            if (joint) dir[dirLength] = kSeparator;
+            if (joint) dir[dirLength] = kZkPathSeparator;
             std::memcpy(dir + dirLength + joint, m_fname, moved);
             dir[dirLength + joint + moved] = '\0';
             delete[] m_dir;
@@ -127,7 +118,7 @@ void zkFilename::Rebuild(int, int, int, int, int) {
     dropIfEmpty(&m_ext);
     if (m_ext == nullptr && m_fname) {
         size_t n = std::strlen(m_fname);
-        size_t dot = extensionDot(m_fname, n);
+        size_t dot = zkExtensionDot(m_fname, n);
         if (dot < n) {
             Dup(&m_ext, m_fname + dot + 1, -1);
             m_fname[dot] = '\0';
@@ -139,10 +130,10 @@ void zkFilename::Rebuild(int, int, int, int, int) {
     size_t dirLength = m_dir ? std::strlen(m_dir) : 0;
     size_t nameLength = m_fname ? std::strlen(m_fname) : 0;
     size_t extLength = m_ext ? std::strlen(m_ext) : 0;
-    bool joint = dirLength && m_dir[dirLength - 1] != kSeparator;
+    bool joint = dirLength && m_dir[dirLength - 1] != kZkPathSeparator;
     if (joint) {
         char* dir = copyOf(m_dir, dirLength + 1);
-        dir[dirLength++] = kSeparator;
+        dir[dirLength++] = kZkPathSeparator;
         delete[] m_dir;
         m_dir = dir;
     }
