@@ -1,5 +1,6 @@
 #include "zkStringBase.h"
 
+#include <cassert>
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
@@ -65,6 +66,7 @@ zkStringBase::~zkStringBase() {
 }
 
 void zkStringBase::setData(unsigned capacity, unsigned length, CompareType type) {
+    assert(length < capacity);
     m_data = new char[capacity];
     m_capacity = capacity;
     m_length = length;
