@@ -9,7 +9,7 @@ set -euo pipefail
 cd "$(dirname "$0")/.."
 
 build=${1:-build/bench}
-cmake -S . -B "$build" -DCMAKE_BUILD_TYPE=Release -DZK_BUILD_BENCH=ON -DZK_BUILD_TESTS=OFF >/dev/null
+cmake -S . -B "$build" -DCMAKE_BUILD_TYPE=Release -DZKUTIL_BUILD_BENCH=ON -DZKUTIL_BUILD_TESTS=OFF >/dev/null
 cmake --build "$build" -j2 >/dev/null
 
 if [ -n "${ZK_BENCH_DIR:-}" ]; then

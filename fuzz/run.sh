@@ -11,7 +11,7 @@ targets=("$@")
 [ ${#targets[@]} -gt 0 ] || targets=(ini cmdline version path tokenizer string)
 build=${ZK_FUZZ_BUILD:-build/fuzz}
 
-CC=clang CXX=clang++ cmake -S . -B "$build" -DZK_FUZZ=ON -DZK_BUILD_TESTS=OFF -DZK_WERROR=ON >/dev/null
+CC=clang CXX=clang++ cmake -S . -B "$build" -DZKUTIL_FUZZ=ON -DZKUTIL_BUILD_TESTS=OFF -DZKUTIL_WERROR=ON >/dev/null
 cmake --build "$build" -j2 --target $(printf '%s_fuzz ' "${targets[@]}") >/dev/null
 
 status=0

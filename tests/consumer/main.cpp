@@ -1,10 +1,13 @@
-// Uses one class of each family through the installed headers and library.
+// Uses one class of each family through zkutil's headers, in both include
+// forms, and checks that the library it runs with is the one it was built for.
 #include <zkBStringTokenizer.h>
 #include <zkCommandLineParser.h>
 #include <zkStringBase.h>
-#include <zkVersionDescriptor.h>
+#include <zkutil/zkVersionDescriptor.h>
+#include <zkutil/zkutilVersion.h>
 
 #include <cstdio>
+#include <cstring>
 
 int main() {
     zkStringBase line("a, b ,c");
@@ -16,7 +19,8 @@ int main() {
     args.ParseCommand();
 
     zkVersionDescriptor older("1.2a"), newer("1.10");
-    bool ok = joined == "abc" && args.GetValue("name") == "value" && older < newer;
-    std::printf("consumer: %s\n", ok ? "ok" : "FAILED");
+    bool ok = joined == "abc" && args.GetValue("name") == "value" && older < newer &&
+              std::strcmp(zkutilVersion(), ZKUTIL_VERSION) == 0;
+    std::printf("consumer of zkutil %s: %s\n", zkutilVersion(), ok ? "ok" : "FAILED");
     return ok ? 0 : 1;
 }

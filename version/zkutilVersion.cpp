@@ -1,0 +1,3 @@
+#include "zkutilVersion.h"
+
+const char* zkutilVersion() { return ZKUTIL_VERSION; }
