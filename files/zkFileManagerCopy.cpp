@@ -1,5 +1,6 @@
 #include "zkFileManager.h"
 
+#include <dirent.h>
 #include <errno.h>
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -52,6 +53,13 @@ bool hasWildcard(const char* path) {
 
 bool sameFile(const struct stat& a, const struct stat& b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
+bool isReadableDirectory(const std::string& path) {
+    DIR* stream = opendir(path.empty() ? "." : path.c_str());
+    if (stream == nullptr) return false;
+    closedir(stream);
+    return true;
 }
 
 std::string asDirectory(const char* path) {
@@ -202,6 +210,9 @@ int copyEntries(zkFilename& source, zkFilename& destination, const Options& opti
     }
 
     std::string sourceDir = source.GetDirectory();
+    // A directory that cannot be read (no permission, or a path past the
+    // system's limit) fails; the listing below would only find it empty.
+    if (!isReadableDirectory(sourceDir)) return 1;
     int failed = 0;
     for (zkDirIterator it(source.GetFullPath()), end; it != end; ++it) {
         const char* name = it.GetName();
