@@ -134,3 +134,119 @@ TEST(IniEditor, ReadsAsTheDocumentAndSavesEveryByte) {
         EXPECT_EQ(original, zkReadFile(dir.file(row.file)));
     }
 }
+
+// Text that would not read back as given is refused and changes nothing;
+// text at the edge of the rules is taken and reads back unchanged.
+TEST(IniEditor, RefusesTextThatWouldNotReadBack) {
+    const struct {
+        const char* section;
+        const char* key;
+        const char* value;
+        int result;
+    } rows[] = {
+        {"a]b", "k", "v", zkINIEditor::Refused},  {"a\nb", "k", "v", zkINIEditor::Refused},
+        {" a", "k", "v", zkINIEditor::Refused},   {"a", "", "v", zkINIEditor::Refused},
+        {"a", "k=x", "v", zkINIEditor::Refused},  {"a", "k\rx", "v", zkINIEditor::Refused},
+        {"a", "[k", "v", zkINIEditor::Refused},   {"a", ";k", "v", zkINIEditor::Refused},
+        {"a", "#k", "v", zkINIEditor::Refused},   {"a", "k\t", "v", zkINIEditor::Refused},
+        {"a", "\vk", "v", zkINIEditor::Refused},  {"a", "k", "v\n", zkINIEditor::Refused},
+        {"a", "k", " v", zkINIEditor::Refused},   {"a", "k", "v ", zkINIEditor::Refused},
+        {"a[", "k]", "=v ; not a comment", zkINIEditor::Missing},
+        {"a", "k k", "", zkINIEditor::Missing},
+        {"a", "k", "x", zkINIEditor::Missing},
+    };
+    const std::string original = zkTestData("crlf.ini");
+    for (const auto& row : rows) {
+        SCOPED_TRACE(std::string(row.section) + "/" + row.key + "/" + row.value);
+        zkINIEditor editor;
+        editor.Load(original.data(), original.size());
+        EXPECT_EQ(row.result, editor.SetVal(zkStr(row.section), zkStr(row.key), zkStr(row.value)));
+        zkStringBase text, value("<missing>");
+        editor.GetText(text);
+        const bool refused = row.result == zkINIEditor::Refused;
+        EXPECT_EQ(refused, zkText(text) == original);
+        zkINIEditor reread;
+        reread.Load(text.data(), text.length());
+        reread.GetVal(zkStr(row.section), zkStr(row.key), value);
+        EXPECT_EQ(refused ? "<missing>" : row.value, zkText(value));
+    }
+}
+
+// A section goes with its lines up to the next header; the empty name takes
+// the lines before the first header, the byte-order mark stays.
+TEST(IniEditor, RemoveSectionTakesItsLinesUpToTheNextHeader) {
+    const struct {
+        const char* text;
+        const char* section;
+        int result;
+        const char* left;
+    } rows[] = {
+        {"[a]\nx=1\n\n[b]\ny=2\n", "A", zkINIEditor::Done, "[b]\ny=2\n"},
+        {"[a]\nx=1\n\n[b]\ny=2\n", "b", zkINIEditor::Done, "[a]\nx=1\n\n"},
+        {"[a]\nx=1\n[A]\ny=2\n", "a", zkINIEditor::Done, "[A]\ny=2\n"},
+        {"\xEF\xBB\xBF# c\nk=v\n[a]\n", "", zkINIEditor::Done, "\xEF\xBB\xBF[a]\n"},
+        {"\n\n[a]\n", "", zkINIEditor::Missing, "\n\n[a]\n"},
+        {"[a]\n", "b", zkINIEditor::Missing, "[a]\n"},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.text);
+        zkINIEditor editor;
+        editor.Load(row.text, std::string(row.text).size());
+        EXPECT_EQ(row.result, editor.RemoveSection(zkStr(row.section)));
+        zkStringBase text;
+        editor.GetText(text);
+        EXPECT_EQ(row.left, zkText(text));
+    }
+}
+
+// New keys of the empty name open a file without lines before its first
+// header; a new section in an empty file needs no blank line before it.
+TEST(IniEditor, NewLinesTakeTheFilesLineEnds) {
+    const struct {
+        const char* text;
+        const char* section;
+        const char* expected;
+    } rows[] = {
+        {"", "s", "[s]\nk=v\n"},
+        {"\xEF\xBB\xBF", "s", "\xEF\xBB\xBF[s]\nk=v\n"},
+        {"", "", "k=v\n"},
+        {"\r\n[a]\r\n", "", "k=v\r\n\r\n[a]\r\n"},
+        {"x=1\r", "", "x=1\rk=v\r"},
+        {"[a]\r\n\r\n", "b", "[a]\r\n\r\n[b]\r\nk=v\r\n"},
+        {"[a]", "a", "[a]\nk=v"},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.text);
+        zkINIEditor editor;
+        editor.Load(row.text, std::string(row.text).size());
+        EXPECT_EQ(zkINIEditor::Missing, editor.SetVal(zkStr(row.section), zkStr("k"), zkStr("v")));
+        zkStringBase text;
+        editor.GetText(text);
+        EXPECT_EQ(row.expected, zkText(text));
+    }
+}
+
+// A merge sets every key of the other file, the lines before its first
+// header included; one key that would be refused stops it before any is set.
+TEST(IniEditor, MergeSetsEveryKeyOrNone) {
+    const std::string original = "# head\nk=1\n\n[a]\nx = 1\n";
+    const struct {
+        const char* other;
+        int result;
+        const char* expected;
+    } rows[] = {
+        {"k=2\n[A]\nx=2\ny=3\n; c\n[b]\nz=4\n", zkINIEditor::Done, "# head\nk=2\n\n[a]\nx = 2\ny=3\n\n[b]\nz=4\n"},
+        {"[a]\nx=2\n[b]\n=4\n", zkINIEditor::Refused, "# head\nk=1\n\n[a]\nx = 1\n"},
+        {"[a]\nx=2\n[b]c]\nz=4\n", zkINIEditor::Refused, "# head\nk=1\n\n[a]\nx = 1\n"},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.other);
+        zkINIEditor editor, other;
+        editor.Load(original.data(), original.size());
+        other.Load(row.other, std::string(row.other).size());
+        EXPECT_EQ(row.result, editor.MergeFrom(other));
+        zkStringBase text;
+        editor.GetText(text);
+        EXPECT_EQ(row.expected, zkText(text));
+    }
+}
