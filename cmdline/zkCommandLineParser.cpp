@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "../internal/zkCaseTables.h"
+#include "../internal/zkCharRules.h"
 #include "../internal/zkOutOfMemory.h"
 
 namespace {
@@ -19,21 +20,15 @@ constexpr std::size_t kInitialBuckets = 100;
 constexpr char kItemSeparator = ' ';
 constexpr char kQuote = '"';
 
-// What an unquoted value skips before it starts.
-bool isBlankOrLineEnd(char c) {
-    return c == ' ' || c == '\t' || c == '\r' || c == '\n';
-}
-
 // The first c in [from, end), or null.
 const char* findIn(const char* from, const char* end, char c) {
+    if (from >= end) return nullptr;
     return static_cast<const char*>(std::memchr(from, c, static_cast<std::size_t>(end - from)));
 }
 
-// Replaces the text of s with the bytes [from, to). append() would measure an
-// empty range with strlen, so an empty one only empties s.
+// Replaces the text of s with the bytes [from, to).
 void assignRange(zkStringBase& s, const char* from, const char* to) {
-    s.makeNull();
-    if (to > from) s.append(from, static_cast<unsigned>(to - from));
+    s.assign(from, to > from ? static_cast<unsigned>(to - from) : 0u);
 }
 
 // Objects the parser owns through a pointer are allocated as the containers'
@@ -173,7 +168,7 @@ int zkCommandLineParser::ParseCmdLine() {
         } else {
             // Only a space ends the value: a switch character, a quote or a
             // tab inside it is plain text.
-            while (p < end && isBlankOrLineEnd(*p)) ++p;
+            while (p < end && zkIsBlankOrLineEnd(*p)) ++p;
             const char* space = findIn(p, end, kItemSeparator);
             assignRange(value, p, space ? space : end);
             value.stripWhite(zkStringBase::StripEnds);
@@ -241,12 +236,12 @@ void zkCommandLineParser::store(const zkStringBase& name, const zkStringBase& va
     // new, so the entry is built first and the table searched once; an
     // existing name drops the new entry and keeps its own.
     zkStringBase sizedName(name.length() + 1u);
-    if (!name.isNull()) sizedName.append(name.data(), name.length());
+    sizedName.assign(name.data(), name.length());
     auto placed = m_values->map.emplace(std::piecewise_construct, std::forward_as_tuple(sizedName),
                                         std::forward_as_tuple(value.length() + 1u));
     zkStringBase& stored = placed.first->second;
     if (placed.second) {
-        if (!value.isNull()) stored.append(value.data(), value.length());
+        stored.assign(value.data(), value.length());
         stored.setCompareType(value.getCompareType());
     } else {
         stored = value;

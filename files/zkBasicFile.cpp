@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstring>
 
+#include "../internal/zkStringRules.h"
 #include "zkStringBase.h"
 
 static_assert(sizeof(off_t) == 8, "file offsets must be 64-bit: build with _FILE_OFFSET_BITS=64");
@@ -17,10 +18,6 @@ constexpr unsigned kDefaultMode = 0666;
 
 // ReadAll reads in blocks of this size.
 constexpr unsigned kReadBlockSize = 2048;
-
-// The longest text a zkStringBase can hold: its capacity, a 32-bit count,
-// must also leave room for the terminator.
-constexpr unsigned long long kMaxStringLength = 0xFFFFFFFEull;
 
 unsigned long long widen(off_t position) {
     return position < 0 ? zkBasicFile::kBadPosition : static_cast<unsigned long long>(position);
@@ -113,12 +110,9 @@ int zkBasicFile::ReadAll(zkStringBase& text) {
     unsigned long long position = GetCurrentFilePointer();
     if (size != kBadPosition && position != kBadPosition && size > position) {
         unsigned long long rest = size - position;
-        if (start + rest > kMaxStringLength) return 1;
+        if (start + rest > kZkMaxStringLength) return 1;
         unsigned long long needed = start + rest + 1;
-        if (text.capacity() < needed) {
-            unsigned long long grown = start + rest + (zkStringBase::_sGrowLength ? zkStringBase::_sGrowLength : 1);
-            text.resize(static_cast<unsigned>(grown > kMaxStringLength + 1 ? kMaxStringLength + 1 : grown));
-        }
+        if (text.capacity() < needed) text.resize(zkAssignCapacity(start + rest));
     }
 
     char block[kReadBlockSize];
@@ -129,7 +123,7 @@ int zkBasicFile::ReadAll(zkStringBase& text) {
             return 1;
         }
         if (got == 0) return 0;
-        if (text.length() + static_cast<unsigned long long>(got) > kMaxStringLength) {
+        if (text.length() + static_cast<unsigned long long>(got) > kZkMaxStringLength) {
             text.cut(static_cast<unsigned>(text.length() - start));
             return 1;
         }

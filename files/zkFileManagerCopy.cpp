@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "../internal/zkFileSystem.h"
+#include "../internal/zkPathRules.h"
 
 namespace {
 
@@ -24,7 +25,6 @@ constexpr unsigned kReadAccess = 0444;
 // A new copy's mode, less the umask and the bits its source lacks.
 constexpr mode_t kCreatedMode = 0664;
 
-constexpr char kSeparator = '/';
 constexpr const char* kAllEntries = "*";
 
 struct Options {
@@ -38,13 +38,13 @@ struct Options {
 // The directory that the outermost directory copy fills. Entries that are
 // this directory are skipped, so a destination inside the source tree is
 // never copied into itself.
-struct Root {
+struct OutermostDestination {
     bool known = false;
     dev_t dev = 0;
     ino_t ino = 0;
 };
 
-int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, Root& root);
+int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, OutermostDestination& outermost);
 
 bool hasWildcard(const char* path) {
     return std::strpbrk(path, "*?") != nullptr;
@@ -56,7 +56,7 @@ bool sameFile(const struct stat& a, const struct stat& b) {
 
 std::string asDirectory(const char* path) {
     std::string dir(path);
-    if (dir.empty() || dir.back() != kSeparator) dir += kSeparator;
+    if (dir.empty() || dir.back() != kZkPathSeparator) dir += kZkPathSeparator;
     return dir;
 }
 
@@ -129,10 +129,10 @@ int copyContents(zkFilename& source, zkFilename& destination, const Options& opt
     return 0;
 }
 
-int copyOne(zkFilename& source, zkFilename& destination, const Options& options, Root& root) {
-    int type = source.GetType();
-    if (type == 0) return 1;
-    if (type == 1) {
+int copyOne(zkFilename& source, zkFilename& destination, const Options& options, OutermostDestination& outermost) {
+    const int type = source.GetType();
+    if (type == zkFilename::NoEntry) return 1;
+    if (type == zkFilename::DirectoryEntry) {
         // The whole path becomes the directory part, so that /a/src and
         // /a/src/ both copy the entries of src.
         std::string dir = asDirectory(source.GetFullPath());
@@ -140,7 +140,7 @@ int copyOne(zkFilename& source, zkFilename& destination, const Options& options,
         zkFilename::Dup(&source.m_fname, kAllEntries, -1);
         zkFilename::Dup(&source.m_ext, nullptr, -1);
         source.Rebuild(0, 0, 0, 0, 0);
-        return copyEntries(source, destination, options, root);
+        return copyEntries(source, destination, options, outermost);
     }
     // An empty directory part is the current directory, which exists.
     const char* destinationDir = destination.GetDirectory();
@@ -159,7 +159,7 @@ int copyOne(zkFilename& source, zkFilename& destination, const Options& options,
         destination.Rebuild(0, 0, 0, 0, 0);
     }
     if (zkStringBase::equalStrings(destination.GetFullPath(), source.GetFullPath(), false)) return 1;
-    if (type != 2) return 1;
+    if (type != zkFilename::RegularFileEntry) return 1;
     return copyContents(source, destination, options);
 }
 
@@ -185,7 +185,7 @@ int copyLink(const std::string& from, const std::string& to, const Options& opti
 
 // The directory copy: destination becomes a directory and receives every
 // entry of source's directory that matches source's name part.
-int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, Root& root) {
+int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, OutermostDestination& outermost) {
     // A link for the whole directory is tried first. Its path is the
     // destination's directory part, which ends in '/', and symlink refuses a
     // new path that ends so; the entries are then linked one by one below.
@@ -193,12 +193,12 @@ int copyEntries(zkFilename& source, zkFilename& destination, const Options& opti
     if (!zkFileManager::CreateDirectory(destination.GetFullPath(), nullptr)) return 1;
     // The entries go inside the destination also when its path does not end in '/'.
     std::string destinationDir = asDirectory(destination.GetFullPath());
-    if (!root.known) {
+    if (!outermost.known) {
         struct stat st;
         if (stat(destinationDir.c_str(), &st) != 0) return 1;
-        root.known = true;
-        root.dev = st.st_dev;
-        root.ino = st.st_ino;
+        outermost.known = true;
+        outermost.dev = st.st_dev;
+        outermost.ino = st.st_ino;
     }
 
     std::string sourceDir = source.GetDirectory();
@@ -220,11 +220,11 @@ int copyEntries(zkFilename& source, zkFilename& destination, const Options& opti
             failed += copyLink(from, to, options);
             continue;
         }
-        if (directory && st.st_dev == root.dev && st.st_ino == root.ino) continue;
+        if (directory && st.st_dev == outermost.dev && st.st_ino == outermost.ino) continue;
         // Entry names are taken literally: a name holding '*' or '?' is one file.
         zkFilename entry(from.c_str());
         zkFilename target(to.c_str());
-        failed += copyOne(entry, target, options, root);
+        failed += copyOne(entry, target, options, outermost);
     }
     return failed;
 }
@@ -234,9 +234,9 @@ int copyEntries(zkFilename& source, zkFilename& destination, const Options& opti
 int zkFileManager::CopyFile(zkFilename& source, zkFilename& destination, unsigned recursive, unsigned makeDir,
                             unsigned overwrite, unsigned symLink, unsigned deleteSource, const char*, const char*) {
     Options options{recursive, makeDir, overwrite, symLink, deleteSource};
-    Root root;
-    if (hasWildcard(source.GetFullPath())) return copyEntries(source, destination, options, root);
-    return copyOne(source, destination, options, root);
+    OutermostDestination outermost;
+    if (hasWildcard(source.GetFullPath())) return copyEntries(source, destination, options, outermost);
+    return copyOne(source, destination, options, outermost);
 }
 
 int zkFileManager::CopyFile(zkStringBase& source, zkStringBase& destination, unsigned recursive, unsigned makeDir,

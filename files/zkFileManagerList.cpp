@@ -9,40 +9,9 @@
 #include <new>
 
 #include "../internal/zkOutOfMemory.h"
+#include "../internal/zkPathRules.h"
 
 namespace {
-
-// Appends a copy of value; a list node that cannot be allocated ends the
-// process as the library's containers do.
-template <class T>
-void appendTo(std::list<T>& list, const T& value) {
-    try {
-        list.push_back(value);
-    } catch (const std::bad_alloc&) {
-        zkOutOfMemory();
-    }
-}
-
-// Appends an empty record and returns it, ending the process as above when
-// its node cannot be allocated.
-zkFileInfo& appendFresh(std::list<zkFileInfo>& list) {
-    try {
-        list.emplace_back();
-    } catch (const std::bad_alloc&) {
-        zkOutOfMemory();
-    }
-    return list.back();
-}
-
-// Where the extension's dot is in an entry name of n bytes, or n when it has
-// none, by zkFilename's rule: the last dot, unless it is the first or the
-// last character.
-size_t extensionDot(const char* name, size_t n) {
-    for (size_t i = n; i-- > 1;) {
-        if (name[i] == '.') return i + 1 < n ? i : n;
-    }
-    return n;
-}
 
 bool isDotOrDotDot(const char* name) {
     return name[0] == '.' && (name[1] == '\0' || (name[1] == '.' && name[2] == '\0'));
@@ -98,9 +67,9 @@ void listFolders(int fd, const zkStringBase& root, const zkStringBase& relative,
         if (fullPaths) {
             zkStringBase full;
             zkFileManager::MakePath(full, root, relative, name);
-            appendTo(folders, full);
+            zkAppendNode(folders, full);
         } else {
-            appendTo(folders, below);
+            zkAppendNode(folders, below);
         }
         // A folder reached through a link is listed but not entered, so a
         // link back up the tree cannot make the walk endless. The folder is
@@ -132,7 +101,7 @@ int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<z
         if (entry->d_type == DT_DIR) continue;
         const char* const name = entry->d_name;
         const size_t length = std::strlen(name);
-        const size_t dot = extensionDot(name, length);
+        const size_t dot = zkExtensionDot(name, length);
         if (std::strcmp(dot < length ? name + dot + 1 : "", wanted) != 0) continue;
         struct stat st;
         if (fstatat(listing.fd(), name, &st, 0) == 0) {
@@ -144,7 +113,7 @@ int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<z
         // A link whose target is missing is described by the link itself.
         // The record is made in its list node rather than copied there; its
         // parts are set and rebuilt as on any fresh record.
-        zkFileInfo& record = appendFresh(files);
+        zkFileInfo& record = zkAppendNode(files);
         zkFilename::Dup(&record.m_file.m_ext, dot < length ? name + dot + 1 : "", -1);
         zkFilename::Dup(&record.m_file.m_fname, name, static_cast<int>(dot));
         record.m_file.Rebuild(0, 0, 0, 0, 0);

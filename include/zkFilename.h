@@ -75,8 +75,11 @@ public:
     virtual void SetDirectory(const char* dir);
     virtual void SetName(const char* name);
     virtual void SetExtension(const char* ext);
-    /// 1 for a directory, 2 for a regular file, 3 for another existing entry,
-    /// 0 when the path cannot be examined; symbolic links are followed.
+    /// The results of GetType.
+    enum EntryType : int { NoEntry = 0, DirectoryEntry = 1, RegularFileEntry = 2, OtherEntry = 3 };
+    /// DirectoryEntry (1) for a directory, RegularFileEntry (2) for a regular
+    /// file, OtherEntry (3) for another existing entry, NoEntry (0) when the
+    /// path cannot be examined; symbolic links are followed.
     virtual int GetType() const;
     /// Nonzero when the path names an existing entry: with noFollow 0 a
     /// symbolic link counts only when its target exists, with any other value

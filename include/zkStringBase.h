@@ -81,6 +81,9 @@ public:
     void operator=(const char* s);
     /// The string becomes the single character ch (growing when needed).
     void operator=(char ch);
+    /// Replaces the text with the n bytes at s (n == 0: the empty text; s may
+    /// point into this string); the compare type stays.
+    void assign(const char* s, unsigned n);
 
     /// Raw initialiser: allocates a buffer of `capacity` bytes without releasing
     /// any previous one, stores the length, writes the terminator at `length`
@@ -260,9 +263,6 @@ public:
     zkStringBase& stripWhite(StripType bits);
 
 protected:
-    /// The tokenizer fills its tokens in place, one per call, in a hot loop.
-    friend class zkBStringTokenizer;
-
     char* m_data;
     unsigned m_length;
     unsigned m_capacity;

@@ -26,23 +26,4 @@ inline void zkAssignSized(zkStringBase& s, const zkStringBase& source) {
     s.setCompareType(source.getCompareType());
 }
 
-// Appends value to a standard list; a node that cannot be allocated ends the
-// process as the library's containers do.
-template <class List, class Value>
-void zkAppendNode(List& list, Value&& value) {
-    try {
-        list.push_back(std::forward<Value>(value));
-    } catch (const std::bad_alloc&) {
-        zkOutOfMemory();
-    }
-}
-
-// A new T built from args; a record that cannot be allocated ends the process.
-template <class T, class... Args>
-T* zkNewRecord(Args&&... args) {
-    T* record = new (std::nothrow) T(std::forward<Args>(args)...);
-    if (record == nullptr) zkOutOfMemory();
-    return record;
-}
-
 #endif

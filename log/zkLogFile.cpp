@@ -11,7 +11,6 @@
 
 namespace {
 
-constexpr int kYearBase = 1900;
 constexpr unsigned kFullYearDigits = 4;
 constexpr unsigned kShortYearFrom = 2;
 constexpr unsigned kShortYearTo = 3;
@@ -21,14 +20,12 @@ constexpr long kTwoDigitsMax = 99;
 // The years written with four digits, of which the date shows the last two.
 constexpr long kFirstFourDigitYear = 1000;
 constexpr long kLastFourDigitYear = 9999;
-constexpr long kCentury = 100;
-constexpr int kDecimal = 10;
 
 // Appends n, which lies within [0, 99], as two digits.
 void appendTwoDigits(zkStringBase& out, int n) {
     assert(n >= 0 && n <= kTwoDigitsMax);
-    out.append(static_cast<char>('0' + n / kDecimal));
-    out.append(static_cast<char>('0' + n % kDecimal));
+    out.append(static_cast<char>('0' + n / 10));
+    out.append(static_cast<char>('0' + n % 10));
 }
 
 }  // namespace
@@ -150,9 +147,9 @@ void zkLogFile::GetCurrTimeAndDate(zkStringBase& time, zkStringBase& date) {
     date.append('/');
     appendTwoDigits(date, local.tm_mday);
     date.append('/');
-    const long year = static_cast<long>(local.tm_year) + kYearBase;
+    const long year = static_cast<long>(local.tm_year) + 1900;
     if (year >= kFirstFourDigitYear && year <= kLastFourDigitYear) {
-        appendTwoDigits(date, static_cast<int>(year % kCentury));
+        appendTwoDigits(date, static_cast<int>(year % 100));
     } else {
         MakeTDNum(m_number, year, 0);
         if (m_number.length() == kFullYearDigits) {

@@ -6,16 +6,12 @@
 #include <new>
 #include <string>
 
+#include "../internal/zkStringRules.h"
+
 unsigned zkStringBase::_sGrowLength = 128;
 const zkStringBase zkStringBase::NullStr;
 
 namespace {
-
-// The largest capacity a buffer can have: the 32-bit limit of the fields.
-constexpr unsigned long long kMaxCapacity = 0xFFFFFFFFull;
-
-// Room for the "%ld" text of a 64-bit long and its terminator.
-constexpr int kLongTextSize = 32;
 
 bool pointsInto(const char* p, const char* buffer, unsigned size) {
     // Compared as addresses so that unrelated pointers are handled too.
@@ -39,7 +35,7 @@ zkStringBase::zkStringBase(const char* s, unsigned n)
     if (s == nullptr) n = 0;
     unsigned long long capacity = static_cast<unsigned long long>(n) + _sGrowLength;
     if (capacity <= n) capacity = n + 1ull;
-    if (capacity > kMaxCapacity) throw std::bad_alloc();
+    if (capacity > kZkMaxCapacity) throw std::bad_alloc();
     setData(static_cast<unsigned>(capacity), n, CaseSensitive);
     if (n) std::memcpy(m_data, s, n);
 }
@@ -91,10 +87,14 @@ void zkStringBase::operator=(char ch) {
     assignBytes(&ch, 1);
 }
 
+void zkStringBase::assign(const char* s, unsigned n) {
+    assignBytes(s, n);
+}
+
 void zkStringBase::assignBytes(const char* s, unsigned n) {
     // A source inside this buffer is shorter than the capacity, so it never
     // triggers the growth that would release it.
-    growForAssign(n);
+    if (n >= m_capacity) growForAssign(n);
     std::memmove(m_data, s, n);
     m_length = n;
     m_data[n] = '\0';
@@ -105,19 +105,18 @@ void zkStringBase::assignBytes(const char* s, unsigned n) {
 void zkStringBase::growFor(unsigned added) {
     unsigned long long needed = static_cast<unsigned long long>(m_length) + added + 1;
     if (needed <= m_capacity) return;
-    if (needed > kMaxCapacity) throw std::bad_alloc();
+    if (needed > kZkMaxCapacity) throw std::bad_alloc();
     unsigned long long capacity = needed + _sGrowLength;
-    resize(static_cast<unsigned>(capacity > kMaxCapacity ? kMaxCapacity : capacity));
+    resize(static_cast<unsigned>(capacity > kZkMaxCapacity ? kZkMaxCapacity : capacity));
 }
 
 void zkStringBase::growForAssign(unsigned n) {
     if (n < m_capacity) return;
-    if (n >= kMaxCapacity) throw std::bad_alloc();
+    if (n >= kZkMaxCapacity) throw std::bad_alloc();
     // The old characters are about to be overwritten: let resize copy none.
     m_length = 0;
     m_data[0] = '\0';
-    unsigned long long capacity = static_cast<unsigned long long>(n) + (_sGrowLength ? _sGrowLength : 1);
-    resize(static_cast<unsigned>(capacity > kMaxCapacity ? kMaxCapacity : capacity));
+    resize(zkAssignCapacity(n));
 }
 
 void zkStringBase::resize(unsigned newCapacity) {
@@ -143,7 +142,7 @@ void zkStringBase::makeNull() {
 void zkStringBase::spliceIn(unsigned pos, const char* s, unsigned n) {
     if (n == 0) return;
     // The limit is tested before anything is read from s.
-    if (static_cast<unsigned long long>(m_length) + n + 1 > kMaxCapacity) throw std::bad_alloc();
+    if (static_cast<unsigned long long>(m_length) + n + 1 > kZkMaxCapacity) throw std::bad_alloc();
     if (pos == m_length && !pointsInto(s, m_data, m_capacity)) {
         // An append from outside the buffer: nothing to move or protect but
         // the byte at the end, which goes behind the new text as below.
@@ -193,7 +192,7 @@ zkStringBase& zkStringBase::append(char ch) {
 }
 
 zkStringBase& zkStringBase::append(long value) {
-    char text[kLongTextSize];
+    char text[kZkLongTextSize];
     std::snprintf(text, sizeof text, "%ld", value);
     return append(text, 0);
 }

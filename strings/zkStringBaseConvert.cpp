@@ -1,30 +1,17 @@
 #include "zkStringBase.h"
 
-#include <cctype>
 #include <cstdio>
 #include <cstdlib>
 
 #include "../internal/zkCaseTables.h"
+#include "../internal/zkCharRules.h"
+#include "../internal/zkStringRules.h"
 
 namespace {
 
 // Room for the "%.*f" text of an ordinary number; longer texts are formatted
 // straight into the string's buffer.
 constexpr int kNumberTextSize = 128;
-constexpr int kLongTextSize = 32;
-
-bool isSpace(char c) {
-    return std::isspace(static_cast<signed char>(c)) != 0;
-}
-
-bool isDigit(char c) {
-    return std::isdigit(static_cast<signed char>(c)) != 0;
-}
-
-// The blanks that skipNextWhite passes over.
-bool isBlankOrLineEnd(char c) {
-    return c == ' ' || c == '\t' || c == '\r' || c == '\n';
-}
 
 }  // namespace
 
@@ -50,7 +37,7 @@ void zkStringBase::fromDouble(double value, int decimals) {
 }
 
 void zkStringBase::fromLong(long value) {
-    char text[kLongTextSize];
+    char text[kZkLongTextSize];
     int n = std::snprintf(text, sizeof text, "%ld", value);
     assignBytes(text, static_cast<unsigned>(n));
 }
@@ -59,21 +46,21 @@ bool zkStringBase::isNumber() const {
     bool digit = false, sign = false, point = false, exponent = false;
     for (unsigned i = 0; i < m_length; ++i) {
         char c = m_data[i];
-        if (isDigit(c)) {
+        if (zkIsDigit(c)) {
             digit = true;
         } else if (c == '.') {
             if (point || exponent) return false;
             point = true;
         } else if (c == '+' || c == '-') {
             if (sign || digit) return false;
-            if (i + 1 >= m_length || !isDigit(m_data[i + 1])) return false;
+            if (i + 1 >= m_length || !zkIsDigit(m_data[i + 1])) return false;
             sign = true;
         } else if (c == 'E' || c == 'e') {
             if (!digit || exponent) return false;
             exponent = true;
             if (i + 1 >= m_length) return false;
             char next = m_data[i + 1];
-            if (next != '+' && next != '-' && !isDigit(next)) return false;
+            if (next != '+' && next != '-' && !zkIsDigit(next)) return false;
             ++i;  // the sign or digit after the exponent mark is taken as it is
         } else if (c == ' ' || c == '\t') {
             if (digit || sign || point || exponent) return false;
@@ -86,7 +73,7 @@ bool zkStringBase::isNumber() const {
 
 unsigned zkStringBase::skipNextWhite(unsigned pos) const {
     if (pos >= m_length) return pos;
-    while (pos < m_length && isBlankOrLineEnd(m_data[pos])) ++pos;
+    while (pos < m_length && zkIsBlankOrLineEnd(m_data[pos])) ++pos;
     return pos;
 }
 
@@ -106,7 +93,7 @@ void zkStringBase::firstUpper() {
     for (unsigned i = 0; i < m_length; ++i) {
         char c = m_data[i];
         if (afterSpace) m_data[i] = static_cast<char>(fold.upper(c));
-        afterSpace = isSpace(c);
+        afterSpace = zkIsSpace(c);
     }
 }
 
@@ -125,18 +112,18 @@ zkStringBase& zkStringBase::stripWhite(StripType bits) {
     if (m_length == 0) return *this;
     if (bits & StripLeading) {
         unsigned lead = 0;
-        while (lead < m_length && isSpace(m_data[lead])) ++lead;
+        while (lead < m_length && zkIsSpace(m_data[lead])) ++lead;
         if (lead) del(0, lead - 1);
     }
     if (bits & StripTrailing) {
-        while (m_length && isSpace(m_data[m_length - 1])) --m_length;
+        while (m_length && zkIsSpace(m_data[m_length - 1])) --m_length;
         m_data[m_length] = '\0';
     }
     if (bits & StripAll) {
         // One pass that keeps the other bytes in order.
         unsigned kept = 0;
         for (unsigned i = 0; i < m_length; ++i)
-            if (!isSpace(m_data[i])) m_data[kept++] = m_data[i];
+            if (!zkIsSpace(m_data[i])) m_data[kept++] = m_data[i];
         m_length = kept;
         m_data[kept] = '\0';
     }

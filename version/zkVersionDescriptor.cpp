@@ -7,7 +7,6 @@
 namespace {
 
 constexpr char kFullStop = '.';
-constexpr int kDecimal = 10;
 
 // strtol's result brought into the 32-bit range, as strtol itself gives it
 // where long has 32 bits, so every build reads the same numbers.
@@ -44,12 +43,12 @@ int zkVersionDescriptor::SetVersionDescriptor(const char* text) noexcept {
 
     // strtol may read the text in place: the major part holds no full stop,
     // and a full stop or the end, where the part ends, is no digit.
-    m_major = clampToInt(std::strtol(text, nullptr, kDecimal));
+    m_major = clampToInt(std::strtol(text, nullptr, 10));
 
     // Without a full stop the minor part is empty rather than whatever lies
     // past the terminator.
     const char* minorText = text[majorLength] == kFullStop ? text + majorLength + 1 : text + majorLength;
-    m_minor = isDecimalDigit(*minorText) ? clampToInt(std::strtol(minorText, nullptr, kDecimal)) : 0;
+    m_minor = isDecimalDigit(*minorText) ? clampToInt(std::strtol(minorText, nullptr, 10)) : 0;
 
     // Position 2n + 1 is the sub-minor when the text reaches it. It is read
     // there even when the minor part is longer than the major part, so 1.10a

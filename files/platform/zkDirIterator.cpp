@@ -8,9 +8,10 @@
 #include <string>
 #include <vector>
 
+#include "../../internal/zkPathRules.h"
+
 namespace {
 
-constexpr char kSeparator = '/';
 constexpr const char* kCurrentDir = ".";
 constexpr const char* kMatchAll = "*";
 
@@ -20,7 +21,7 @@ zkDirIterator::zkDirIterator() : m_names(nullptr), m_end(nullptr), m_name(nullpt
 
 zkDirIterator::zkDirIterator(const char* pattern) : zkDirIterator() {
     if (pattern == nullptr) return;
-    const char* slash = std::strrchr(pattern, kSeparator);
+    const char* slash = std::strrchr(pattern, kZkPathSeparator);
     std::string dir = slash ? std::string(pattern, static_cast<size_t>(slash - pattern) + 1) : kCurrentDir;
     const char* match = slash ? slash + 1 : pattern;
     if (*match == '\0') match = kMatchAll;

@@ -10,9 +10,10 @@
 
 #include "../../internal/zkFileSystem.h"
 
+#include "../../internal/zkPathRules.h"
+
 namespace {
 
-constexpr char kSeparator = '/';
 constexpr mode_t kDefaultDirMode = 0777;
 
 }  // namespace
@@ -27,15 +28,15 @@ int zkCreateDir(const char* path, void* attributes) {
     std::string partial(path);
     size_t end = partial.size();
     while (mkdir(partial.substr(0, end).c_str(), mode) != 0 && errno == ENOENT) {
-        size_t slash = partial.rfind(kSeparator, end - 1);
-        while (slash != std::string::npos && slash > 0 && partial[slash - 1] == kSeparator) --slash;
+        size_t slash = partial.rfind(kZkPathSeparator, end - 1);
+        while (slash != std::string::npos && slash > 0 && partial[slash - 1] == kZkPathSeparator) --slash;
         if (slash == std::string::npos || slash == 0) break;
         end = slash;
     }
     while (end < partial.size()) {
-        end = partial.find(kSeparator, end + 1);
+        end = partial.find(kZkPathSeparator, end + 1);
         if (end == std::string::npos) end = partial.size();
-        if (partial[end - 1] != kSeparator) mkdir(partial.substr(0, end).c_str(), mode);
+        if (partial[end - 1] != kZkPathSeparator) mkdir(partial.substr(0, end).c_str(), mode);
     }
     return zkFilename::IsDirectory(path);
 }

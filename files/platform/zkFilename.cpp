@@ -6,9 +6,10 @@
 #include <cstring>
 #include <initializer_list>
 
+#include "../../internal/zkPathRules.h"
+
 namespace {
 
-constexpr char kSeparator = '/';
 constexpr const char* kSchemeMark = "://";
 constexpr const char* kDefaultProtocol = "file";
 
@@ -23,22 +24,76 @@ char* copyOf(const char* s, size_t n) {
     return copy;
 }
 
-// Where the extension's dot is in a final component of n bytes, or n when it
-// has none. A dot in front (.profile) or at the end (a.) starts no extension,
-// so that joining the parts again gives back the same text.
-size_t extensionDot(const char* name, size_t n) {
-    for (size_t i = n; i-- > 1;) {
-        if (name[i] == '.') return i + 1 < n ? i : n;
-    }
-    return n;
-}
-
 // Replaces an empty part by null, so that every empty part looks the same.
 void dropIfEmpty(char** part) {
     if (*part && **part == '\0') {
         delete[] *part;
         *part = nullptr;
     }
+}
+
+// Moves a directory part that the name holds ("sub/a") to the end of the
+// directory part, joined by one separator.
+void moveDirectoryPart(char** dir, char* name) {
+    const char* slash = name ? std::strrchr(name, kZkPathSeparator) : nullptr;
+    if (slash == nullptr) return;
+    size_t moved = static_cast<size_t>(slash - name) + 1;
+    size_t dirLength = *dir ? std::strlen(*dir) : 0;
+    bool joint = dirLength && (*dir)[dirLength - 1] != kZkPathSeparator;
+    char* joined = new char[dirLength + joint + moved + 1];
+    std::memcpy(joined, text(*dir), dirLength);
+    if (joint) joined[dirLength] = kZkPathSeparator;
+    std::memcpy(joined + dirLength + joint, name, moved);
+    joined[dirLength + joint + moved] = '\0';
+    delete[] *dir;
+    *dir = joined;
+    std::memmove(name, slash + 1, std::strlen(slash + 1) + 1);
+}
+
+// Drops the dot an extension was given with; without an extension, takes
+// the one the name ends in.
+void splitExtension(char* name, char** ext) {
+    if (*ext && **ext == '.') zkFilename::Dup(ext, *ext + 1, -1);
+    dropIfEmpty(ext);
+    if (*ext != nullptr || name == nullptr) return;
+    size_t n = std::strlen(name);
+    size_t dot = zkExtensionDot(name, n);
+    if (dot == n) return;
+    zkFilename::Dup(ext, name + dot + 1, -1);
+    name[dot] = '\0';
+}
+
+// Gives a directory part that does not end in a separator its separator.
+void endWithSeparator(char** dir) {
+    size_t n = *dir ? std::strlen(*dir) : 0;
+    if (n == 0 || (*dir)[n - 1] == kZkPathSeparator) return;
+    char* ended = copyOf(*dir, n + 1);
+    ended[n] = kZkPathSeparator;
+    delete[] *dir;
+    *dir = ended;
+}
+
+// The full path: directory, name and, after a dot, extension; null when all
+// are empty.
+char* joinParts(const char* dir, const char* name, const char* ext) {
+    size_t dirLength = dir ? std::strlen(dir) : 0;
+    size_t nameLength = name ? std::strlen(name) : 0;
+    size_t extLength = ext ? std::strlen(ext) : 0;
+    size_t total = dirLength + nameLength + (extLength ? extLength + 1 : 0);
+    if (total == 0) return nullptr;
+    char* path = new char[total + 1];
+    char* out = path;
+    std::memcpy(out, text(dir), dirLength);
+    out += dirLength;
+    std::memcpy(out, text(name), nameLength);
+    out += nameLength;
+    if (extLength) {
+        *out++ = '.';
+        std::memcpy(out, ext, extLength);
+        out += extLength;
+    }
+    *out = '\0';
+    return path;
 }
 
 }  // namespace
@@ -95,11 +150,11 @@ void zkFilename::split(const char* path) {
     if (path == nullptr || *path == '\0') return;
     size_t n = std::strlen(path);
     m_path = copyOf(path, n);
-    const char* slash = std::strrchr(path, kSeparator);
+    const char* slash = std::strrchr(path, kZkPathSeparator);
     const char* name = slash ? slash + 1 : path;
     if (slash) m_dir = copyOf(path, static_cast<size_t>(name - path));
     size_t nameLength = n - static_cast<size_t>(name - path);
-    size_t dot = extensionDot(name, nameLength);
+    size_t dot = zkExtensionDot(name, nameLength);
     m_fname = copyOf(name, dot);
     if (dot < nameLength) m_ext = copyOf(name + dot + 1, nameLength - dot - 1);
     dropIfEmpty(&m_fname);
@@ -107,62 +162,13 @@ void zkFilename::split(const char* path) {
 }
 
 void zkFilename::Rebuild(int, int, int, int, int) {
-    if (m_fname) {
-        const char* slash = std::strrchr(m_fname, kSeparator);
-        if (slash) {
-            size_t moved = static_cast<size_t>(slash - m_fname) + 1;
-            size_t dirLength = m_dir ? std::strlen(m_dir) : 0;
-            bool joint = dirLength && m_dir[dirLength - 1] != kSeparator;
-            char* dir = new char[dirLength + joint + moved + 1];
-            std::memcpy(dir, text(m_dir), dirLength);
-            if (joint) dir[dirLength] = kSeparator;
-            std::memcpy(dir + dirLength + joint, m_fname, moved);
-            dir[dirLength + joint + moved] = '\0';
-            delete[] m_dir;
-            m_dir = dir;
-            Dup(&m_fname, slash + 1, -1);
-        }
-    }
-    if (m_ext && *m_ext == '.') Dup(&m_ext, m_ext + 1, -1);
-    dropIfEmpty(&m_ext);
-    if (m_ext == nullptr && m_fname) {
-        size_t n = std::strlen(m_fname);
-        size_t dot = extensionDot(m_fname, n);
-        if (dot < n) {
-            Dup(&m_ext, m_fname + dot + 1, -1);
-            m_fname[dot] = '\0';
-        }
-    }
+    moveDirectoryPart(&m_dir, m_fname);
+    splitExtension(m_fname, &m_ext);
     dropIfEmpty(&m_dir);
     dropIfEmpty(&m_fname);
-
-    size_t dirLength = m_dir ? std::strlen(m_dir) : 0;
-    size_t nameLength = m_fname ? std::strlen(m_fname) : 0;
-    size_t extLength = m_ext ? std::strlen(m_ext) : 0;
-    bool joint = dirLength && m_dir[dirLength - 1] != kSeparator;
-    if (joint) {
-        char* dir = copyOf(m_dir, dirLength + 1);
-        dir[dirLength++] = kSeparator;
-        delete[] m_dir;
-        m_dir = dir;
-    }
-    size_t total = dirLength + nameLength + (extLength ? extLength + 1 : 0);
+    endWithSeparator(&m_dir);
     delete[] m_path;
-    m_path = nullptr;
-    if (total) {
-        m_path = new char[total + 1];
-        char* out = m_path;
-        std::memcpy(out, text(m_dir), dirLength);
-        out += dirLength;
-        std::memcpy(out, text(m_fname), nameLength);
-        out += nameLength;
-        if (extLength) {
-            *out++ = '.';
-            std::memcpy(out, m_ext, extLength);
-            out += extLength;
-        }
-        *out = '\0';
-    }
+    m_path = joinParts(m_dir, m_fname, m_ext);
     updateProtocol();
 }
 
@@ -217,9 +223,9 @@ void zkFilename::SetExtension(const char* ext) {
 
 int zkFilename::GetType() const {
     struct stat st;
-    if (stat(text(m_path), &st) != 0) return 0;
-    if (S_ISDIR(st.st_mode)) return 1;
-    return S_ISREG(st.st_mode) ? 2 : 3;
+    if (stat(text(m_path), &st) != 0) return NoEntry;
+    if (S_ISDIR(st.st_mode)) return DirectoryEntry;
+    return S_ISREG(st.st_mode) ? RegularFileEntry : OtherEntry;
 }
 
 int zkFilename::FileExists(int noFollow) const {
