@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "../internal/zkCaseTables.h"
+#include "../internal/zkCharRules.h"
 #include "zkINIEditorImpl.h"
 #include "zkMappedINIFileDetail.h"
 
@@ -27,7 +28,7 @@ bool sameName(const zkINIEditorLine& line, const zkStringBase& name) {
 
 bool isBlank(const zkINIEditorLine& line) {
     for (unsigned i = 0; i < line.length; ++i)
-        if (!zkIsINISpace(line.text[i])) return false;
+        if (!zkIsSpace(line.text[i])) return false;
     return true;
 }
 
@@ -37,13 +38,7 @@ bool hasLineEnd(const zkStringBase& s) {
 
 // Whether s has whitespace at either end, which reading would cut off.
 bool hasOuterSpace(const zkStringBase& s) {
-    return !s.isNull() && (zkIsINISpace(s[0]) || zkIsINISpace(s[s.length() - 1]));
-}
-
-void assign(zkStringBase& s, const char* p, unsigned n) {
-    s.makeNull();
-    // append measures the text with strlen when the count is 0.
-    if (n) s.append(p, n);
+    return !s.isNull() && (zkIsSpace(s[0]) || zkIsSpace(s[s.length() - 1]));
 }
 
 }  // namespace
@@ -189,7 +184,7 @@ void zkINIEditor::Impl::appendSection(const zkStringBase& name, const zkStringBa
 void zkINIEditor::Impl::replaceValue(Line& line, const zkStringBase& value) {
     unsigned from = line.value;
     if (line.hasEquals && line.valueLength == 0)
-        while (from < line.length && zkIsINISpace(line.text[from])) ++from;
+        while (from < line.length && zkIsSpace(line.text[from])) ++from;
     const unsigned to = from + line.valueLength;
     const char* equals = line.hasEquals ? "" : "=";
     line = makeLine({{line.text, from}, {equals, line.hasEquals ? 0u : 1u}, {value.data(), value.length()},
@@ -240,7 +235,7 @@ int zkINIEditor::GetVal(const zkStringBase& section, const zkStringBase& key, zk
     const int k = m_impl->findKey(found, key);
     if (k < 0) return Missing;
     const zkINIEditorLine& line = found.lines[static_cast<size_t>(k)];
-    assign(value, line.text + line.value, line.valueLength);
+    value.assign(line.text + line.value, line.valueLength);
     return Done;
 }
 

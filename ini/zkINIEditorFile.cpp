@@ -10,15 +10,13 @@
 #include <cstring>
 
 #include "../internal/zkFileSystem.h"
+#include "../internal/zkStringRules.h"
 #include "zkINIEditorImpl.h"
 
 namespace {
 
 // The mode of a file that Open or Save creates, less the umask.
 constexpr mode_t kNewFileMode = 0666;
-
-// The longest text the editor takes: the most a zkStringBase could hold.
-constexpr unsigned long long kMaxTextLength = 0xFFFFFFFEull;
 
 // The first pause between tries of a held lock, doubled up to the longest.
 constexpr long kFirstPauseNs = 1000000;
@@ -45,11 +43,12 @@ bool sameFile(const struct stat& a, const struct stat& b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
 }
 
-// Reads fd from where it stands to its end; false with errno on failure.
+// Reads fd from where it stands to its end; false with errno on failure,
+// EFBIG for a text longer than a string can hold (GetText must give it).
 bool readAll(int fd, std::unique_ptr<char[]>& bytes, size_t& size) {
     struct stat st;
     if (fstat(fd, &st) != 0) return false;
-    if (static_cast<unsigned long long>(st.st_size) > kMaxTextLength) {
+    if (static_cast<unsigned long long>(st.st_size) > kZkMaxStringLength) {
         errno = EFBIG;
         return false;
     }
@@ -69,7 +68,7 @@ bool readAll(int fd, std::unique_ptr<char[]>& bytes, size_t& size) {
         if (n < 0) return false;
         if (n == 0) return true;
         size += static_cast<size_t>(n);
-        if (size > kMaxTextLength) {
+        if (size > kZkMaxStringLength) {
             errno = EFBIG;
             return false;
         }

@@ -1,20 +1,15 @@
 // Classifying one line of INI text.
 #include "zkINILineRules.h"
 
-#include <cctype>
 #include <cstring>
+
+#include "../internal/zkCharRules.h"
 
 namespace {
 
-// The blanks passed over before a line's first character. Other whitespace
-// there makes the line count; it is trimmed off its key later.
-bool isLeadingBlank(char c) {
-    return c == ' ' || c == '\t';
-}
-
 void trim(const char*& first, const char*& last) {
-    while (first < last && zkIsINISpace(*first)) ++first;
-    while (last > first && zkIsINISpace(last[-1])) --last;
+    while (first < last && zkIsSpace(*first)) ++first;
+    while (last > first && zkIsSpace(last[-1])) --last;
 }
 
 // The section name of the header [first, last), which starts with "[". A line
@@ -44,23 +39,21 @@ bool zkStartsWithINIMark(const char* p, const char* end) {
            std::memcmp(p, kINIByteOrderMark, kINIByteOrderMarkSize) == 0;
 }
 
-bool zkIsINISpace(char c) {
-    return std::isspace(static_cast<unsigned char>(c)) != 0;
-}
-
 // A line of one character is ignored whatever it is, a lone "[" or a
 // one-letter key included, and so is a line left with at most one character
 // after its leading blanks. The trailing cut keeps one character, so "[ "
 // is a header (of the empty name) and "a " the key a.
 void zkClassifyINILine(const char* begin, const char* end, zkINILine& line) {
     const char* first = begin;
-    while (first < end && isLeadingBlank(*first)) ++first;
+    // The blanks passed over before a line's first character (a line holds no
+    // line end); other whitespace there makes the line count.
+    while (first < end && zkIsBlankOrLineEnd(*first)) ++first;
     if (end - first <= 1) {
         line.kind = zkINILine::Ignored;
         return;
     }
     const char* last = end;
-    while (last - 1 > first && zkIsINISpace(last[-1])) --last;
+    while (last - 1 > first && zkIsSpace(last[-1])) --last;
 
     if (*first == '[') {
         line.kind = zkINILine::Header;

@@ -15,10 +15,8 @@ constexpr unsigned kINIByteOrderMarkSize = sizeof kINIByteOrderMark - 1;
 // Whether [p, end) starts with the byte-order mark.
 bool zkStartsWithINIMark(const char* p, const char* end);
 
-// The whitespace cut off a line's end and off names, keys and values.
-bool zkIsINISpace(char c);
-
-// What one line of text holds, as pointers into it.
+// What one line of text holds, as pointers into it. Whitespace (zkIsSpace)
+// is cut off a line's end and off names, keys and values.
 struct zkINILine {
     enum Kind : unsigned char {
         Ignored,  // blank, or at most one character after leading blanks

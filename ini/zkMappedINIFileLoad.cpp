@@ -16,9 +16,6 @@ namespace {
 // complete lines before reading the next.
 constexpr size_t kReadBlockSize = size_t{16} << 10;
 
-// The longest file Open accepts: the most a zkStringBase could hold of it.
-constexpr unsigned long long kMaxTextLength = 0xFFFFFFFEull;
-
 // Turns classified lines into sections and lines appended to a list; lines
 // before the first header are not stored.
 class SectionBuilder {
@@ -41,17 +38,17 @@ void SectionBuilder::add(const char* begin, const char* end) {
     zkClassifyINILine(begin, end, text);
     if (text.kind == zkINILine::Header) {
         INISection* section = zkNewRecord<INISection>();
-        zkSetSized(section->m_name, text.name, lengthOf(text.name, text.nameEnd));
+        zkAssignExact(section->m_name, text.name, lengthOf(text.name, text.nameEnd));
         zkAppendNode(m_sections, section);
         m_current = section->m_lines;
     } else if (text.kind != zkINILine::Ignored && m_current != nullptr) {
         INILine* line = zkNewRecord<INILine>();
         if (text.kind == zkINILine::Comment) {
             line->m_isComment = 1;
-            zkSetSized(line->m_value, text.name, lengthOf(text.name, text.nameEnd));
+            zkAssignExact(line->m_value, text.name, lengthOf(text.name, text.nameEnd));
         } else {
-            zkSetSized(line->m_key, text.name, lengthOf(text.name, text.nameEnd));
-            zkSetSized(line->m_value, text.value, lengthOf(text.value, text.valueEnd));
+            zkAssignExact(line->m_key, text.name, lengthOf(text.name, text.nameEnd));
+            zkAssignExact(line->m_value, text.value, lengthOf(text.value, text.valueEnd));
         }
         zkAppendNode(*m_current, line);
     }
@@ -104,7 +101,7 @@ bool scanInBlocks(zkBasicFile& file, SectionBuilder& builder) {
             return false;
         }
         total += got;
-        if (total > kMaxTextLength) return false;
+        if (total > kZkMaxStringLength) return false;
         held += got;
         const bool atEnd = got == 0;
         const char* p = buffer.get();
