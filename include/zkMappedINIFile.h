@@ -177,8 +177,6 @@ private:
     int Save(bool firewall);
     /// Whether a name, key or value holds a CR or LF.
     bool HasLineBreaks() const;
-    /// Appends the sections found in text.
-    void Parse(const zkStringBase& text);
 
     std::list<INISection*> m_sections;
     zkStringBase m_filename;

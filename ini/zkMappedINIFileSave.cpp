@@ -2,6 +2,7 @@
 #include <cerrno>
 
 #include "../internal/zkFileSystem.h"
+#include "../internal/zkStringRules.h"
 #include "zkMappedINIFile.h"
 
 namespace {
@@ -12,8 +13,6 @@ constexpr char kFirewallSection[] = "IPsBehindFirewall";
 // The blank that may follow a line of one character.
 constexpr unsigned long long kLinePad = 1;
 
-// The longest text a zkStringBase can hold.
-constexpr unsigned long long kMaxStringLength = 0xFFFFFFFEull;
 
 // The mode of a file that a save creates, less the umask.
 constexpr mode_t kNewFileMode = 0666;
@@ -74,7 +73,7 @@ bool writeSections(int fd, const std::list<INISection*>& sections, bool firewall
     for (const INISection* section : sections) {
         const bool bare = isBare(*section, firewall);
         unsigned long long size = sectionSize(*section, bare);
-        if (size > kMaxStringLength) {
+        if (size > kZkMaxStringLength) {
             errno = EOVERFLOW;
             return false;
         }
