@@ -143,6 +143,6 @@ int Arguments::CheckValues() {
     if (fromStdin > 1) return Refuse({"standard input can feed only one of -file:, -merge: and -batch:"});
     const zkStringBase& format = ValueOf(Format);
     if (Has(Format) && format != "lines" && format != "sh" && format != "json")
-        return Refuse({"unknown format '", format.data(), "': lines, sh or json"});
+        return Refuse({"unknown format in '-format:", format.data(), "': use lines, sh or json"});
     return 1;
 }

@@ -69,8 +69,9 @@ bool appendJsonString(zkStringBase& out, const zkStringBase& text, zkStringBase&
             error.append(text).append("' is not UTF-8 text, which JSON cannot carry; use -format:sh");
             return false;
         }
-        if (c == '"' || c == '\\') {
-            out.append('\\').append(c);
+        const char* shortEscape = c == '"' ? "\\\"" : c == '\\' ? "\\\\" : c == '\t' ? "\\t" : nullptr;
+        if (shortEscape) {
+            out.append(shortEscape);
         } else if (static_cast<unsigned char>(c) < 0x20) {
             out.append("\\u00").append(kHex[(c >> 4) & 0xF]).append(kHex[c & 0xF]);
         } else {

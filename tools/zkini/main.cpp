@@ -89,6 +89,12 @@ int usageError(const zkStringBase& what) {
     return Usage;
 }
 
+// Text that cannot be written to the file or in the format asked for.
+int refused(const zkStringBase& what) {
+    std::fprintf(stderr, "zkini: %s\n", what.data());
+    return Usage;
+}
+
 int printVersion() {
     zkVersionDescriptor version(ZKINI_VERSION);
     std::printf("zkini %d.%d", version.GetMajor(), version.GetMinor());
@@ -211,7 +217,7 @@ int Tool::Get() {
     zkStringBase value;
     if (m_editor.GetVal(Arg(Arguments::Section), key, value) != zkINIEditor::Done) return NotFound(key);
     zkStringBase out, error;
-    if (!FormatValue(FormatNamed(Arg(Arguments::Format)), key, value, out, error)) return usageError(error);
+    if (!FormatValue(FormatNamed(Arg(Arguments::Format)), key, value, out, error)) return refused(error);
     return Print(out);
 }
 
@@ -227,7 +233,7 @@ int Tool::List() {
     } else {
         formatted = FormatSectionNames(format, m_editor, out, error);
     }
-    if (!formatted) return usageError(error);
+    if (!formatted) return refused(error);
     return Print(out);
 }
 
@@ -236,16 +242,16 @@ int Tool::Set() {
     const zkStringBase& key = Arg(Arguments::Key);
     const zkStringBase& value = Arg(Arguments::Value);
     // Checked before the file is opened, which may create it.
-    if (!zkINIEditor::IsValidSection(section)) return usageError(joined({"the section name cannot be written: '", section.data(), "'"}));
-    if (!zkINIEditor::IsValidKey(key)) return usageError(joined({"the key cannot be written: '", key.data(), "'"}));
-    if (!zkINIEditor::IsValidValue(value)) return usageError(joined({"the value cannot be written: '", value.data(), "'"}));
+    if (!zkINIEditor::IsValidSection(section)) return refused(joined({"the section name cannot be written: '", section.data(), "'"}));
+    if (!zkINIEditor::IsValidKey(key)) return refused(joined({"the key cannot be written: '", key.data(), "'"}));
+    if (!zkINIEditor::IsValidValue(value)) return refused(joined({"the value cannot be written: '", value.data(), "'"}));
     const bool existing = m_args.Has(Arguments::Existing);
     int status = OpenFile(!existing);
     if (status != Done) return status;
     zkStringBase old;
     if (existing && m_editor.GetVal(section, key, old) != zkINIEditor::Done) return NotFound(key);
     if (m_editor.SetVal(section, key, value) == zkINIEditor::Refused)
-        return usageError("the key or value cannot be written");
+        return refused("the key or value cannot be written");
     m_change.append("set [").append(section).append("] ").append(key).append('=').append(value);
     return WriteResult(true);
 }
@@ -278,7 +284,7 @@ int Tool::Merge() {
     int status = OpenFile(false);
     if (status != Done) return status;
     if (m_editor.MergeFrom(other) == zkINIEditor::Refused)
-        return usageError(joined({"a section, key or value of ", shown(path), " cannot be written"}));
+        return refused(joined({"a section, key or value of ", shown(path), " cannot be written"}));
     m_change.append("merge ").append(shown(path));
     return WriteResult(true);
 }
@@ -306,7 +312,7 @@ int Tool::Batch() {
     zkStringBase text, error;
     if (const int readError = ReadPath(path, text)) return fileError("read", shown(path), readError);
     std::vector<BatchChange> changes;
-    if (!ParseBatch(text, changes, error)) return usageError(joined({shown(path), " ", error.data()}));
+    if (!ParseBatch(text, changes, error)) return refused(joined({shown(path), " ", error.data()}));
     if (missingFile && (status = OpenFile(true)) != Done) return status;
     bool changed = false;
     for (const BatchChange& change : changes) {
@@ -314,7 +320,7 @@ int Tool::Batch() {
         if (result == zkINIEditor::Done) {
             changed = true;
         } else if (result == zkINIEditor::Refused) {
-            return usageError(joined({shown(path), " line ", number(change.line).data(), ": cannot be written"}));
+            return refused(joined({shown(path), " line ", number(change.line).data(), ": cannot be written"}));
         } else if (m_args.Has(Arguments::Existing)) {
             if (!m_args.Has(Arguments::Quiet))
                 std::fprintf(stderr, "zkini: %s line %u: no such section or key\n", shown(path), change.line);
