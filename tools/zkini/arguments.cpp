@@ -23,7 +23,8 @@ struct Alias {
     const char* word;
     Arguments::Switch as;
 };
-const Alias kAliases[] = {{"--help", Arguments::Help}, {"-h", Arguments::Help}, {"--version", Arguments::Version}};
+const Alias kAliases[] = {
+    {"--help", Arguments::Help}, {"-h", Arguments::Help}, {"--version", Arguments::Version}};
 
 constexpr unsigned bit(Arguments::Switch s) { return 1u << s; }
 
@@ -96,7 +97,8 @@ int Arguments::CheckWord(const char* word) {
     const size_t nameLength = colon ? static_cast<size_t>(colon - word - 1) : std::strlen(word + 1);
     unsigned found = SwitchCount;
     for (unsigned s = 0; s < SwitchCount; ++s)
-        if (std::strlen(kSwitches[s].name) == nameLength && std::strncmp(kSwitches[s].name, word + 1, nameLength) == 0)
+        if (std::strlen(kSwitches[s].name) == nameLength &&
+            std::strncmp(kSwitches[s].name, word + 1, nameLength) == 0)
             found = s;
     if (!colon)
         for (const Alias& alias : kAliases)
@@ -104,7 +106,8 @@ int Arguments::CheckWord(const char* word) {
     if (found == SwitchCount) return Refuse({"unknown switch '", word, "'"});
     if (kSwitches[found].valued && !colon)
         return Refuse({"'", word, "' lacks its colon: write ", spelling(found).data(), "VALUE"});
-    if (!kSwitches[found].valued && colon) return Refuse({"'", word, "' takes no value: write ", spelling(found).data()});
+    if (!kSwitches[found].valued && colon)
+        return Refuse({"'", word, "' takes no value: write ", spelling(found).data()});
     if (Has(static_cast<Switch>(found))) return Refuse({"'", word, "' repeats ", spelling(found).data()});
     m_given |= 1u << found;
     return 1;
@@ -119,7 +122,8 @@ int Arguments::CheckCombination() {
         action = s;
     }
     if (action == SwitchCount)
-        return Refuse({"no action given: one of -get, -set, -delete, -list, -merge:, -batch:, -normalize, -firewall"});
+        return Refuse({"no action given: one of -get, -set, -delete, -list, -merge:, -batch:, -normalize, "
+                       "-firewall"});
     m_action = static_cast<Switch>(action);
     const ActionRule& rule = kRules[action];
     for (unsigned s = 0; s < SwitchCount; ++s) {

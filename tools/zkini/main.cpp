@@ -126,12 +126,15 @@ private:
     // place that changed nothing saves nothing.
     int WriteResult(bool changed);
     int Print(const zkStringBase& text);
-    int NotFound(const zkStringBase& key);
+    // Says, unless -quiet, that the section or (keyAsked) the key is missing.
+    int NotFound(bool keyAsked);
     void LogChange();
 
     const zkStringBase& Arg(Arguments::Switch s) const { return m_args.ValueOf(s); }
     // Where the result goes: -out:, else the file ("-": standard output).
-    const zkStringBase& Target() const { return m_args.Has(Arguments::Out) ? Arg(Arguments::Out) : Arg(Arguments::File); }
+    const zkStringBase& Target() const {
+        return m_args.Has(Arguments::Out) ? Arg(Arguments::Out) : Arg(Arguments::File);
+    }
     bool InPlace() const { return !m_args.Has(Arguments::Out) && !IsStdStream(Arg(Arguments::File)); }
 
     Arguments& m_args;
@@ -175,11 +178,12 @@ int Tool::Print(const zkStringBase& text) {
     return Done;
 }
 
-int Tool::NotFound(const zkStringBase& key) {
+int Tool::NotFound(bool keyAsked) {
     if (m_args.Has(Arguments::Quiet)) return Missing;
     const zkStringBase& section = Arg(Arguments::Section);
+    const zkStringBase& key = Arg(Arguments::Key);
     const char* file = shown(Arg(Arguments::File));
-    if (key.isNull() || !m_editor.HasSection(section))
+    if (!keyAsked || !m_editor.HasSection(section))
         std::fprintf(stderr, "zkini: no section '%s' in %s\n", section.data(), file);
     else
         std::fprintf(stderr, "zkini: no key '%s' in section '%s' of %s\n", key.data(), section.data(), file);
@@ -215,7 +219,7 @@ int Tool::Get() {
     if (status != Done) return status;
     const zkStringBase& key = Arg(Arguments::Key);
     zkStringBase value;
-    if (m_editor.GetVal(Arg(Arguments::Section), key, value) != zkINIEditor::Done) return NotFound(key);
+    if (m_editor.GetVal(Arg(Arguments::Section), key, value) != zkINIEditor::Done) return NotFound(true);
     zkStringBase out, error;
     if (!FormatValue(FormatNamed(Arg(Arguments::Format)), key, value, out, error)) return refused(error);
     return Print(out);
@@ -228,7 +232,7 @@ int Tool::List() {
     zkStringBase out, error;
     bool formatted;
     if (m_args.Has(Arguments::Section)) {
-        if (!m_editor.HasSection(Arg(Arguments::Section))) return NotFound(zkStringBase::NullStr);
+        if (!m_editor.HasSection(Arg(Arguments::Section))) return NotFound(false);
         formatted = FormatSection(format, m_editor, Arg(Arguments::Section), out, error);
     } else {
         formatted = FormatSectionNames(format, m_editor, out, error);
@@ -242,14 +246,20 @@ int Tool::Set() {
     const zkStringBase& key = Arg(Arguments::Key);
     const zkStringBase& value = Arg(Arguments::Value);
     // Checked before the file is opened, which may create it.
-    if (!zkINIEditor::IsValidSection(section)) return refused(joined({"the section name cannot be written: '", section.data(), "'"}));
-    if (!zkINIEditor::IsValidKey(key)) return refused(joined({"the key cannot be written: '", key.data(), "'"}));
-    if (!zkINIEditor::IsValidValue(value)) return refused(joined({"the value cannot be written: '", value.data(), "'"}));
+    const struct {
+        bool valid;
+        const char* what;
+        const zkStringBase& text;
+    } checks[] = {{zkINIEditor::IsValidSection(section), "section name", section},
+                  {zkINIEditor::IsValidKey(key), "key", key},
+                  {zkINIEditor::IsValidValue(value), "value", value}};
+    for (const auto& check : checks)
+        if (!check.valid) return refused(joined({"the ", check.what, " '", check.text.data(), "' cannot be written"}));
     const bool existing = m_args.Has(Arguments::Existing);
     int status = OpenFile(!existing);
     if (status != Done) return status;
     zkStringBase old;
-    if (existing && m_editor.GetVal(section, key, old) != zkINIEditor::Done) return NotFound(key);
+    if (existing && m_editor.GetVal(section, key, old) != zkINIEditor::Done) return NotFound(true);
     if (m_editor.SetVal(section, key, value) == zkINIEditor::Refused)
         return refused("the key or value cannot be written");
     m_change.append("set [").append(section).append("] ").append(key).append('=').append(value);
@@ -263,7 +273,7 @@ int Tool::Delete() {
     const zkStringBase& key = Arg(Arguments::Key);
     const bool wholeSection = !m_args.Has(Arguments::Key);
     const int result = wholeSection ? m_editor.RemoveSection(section) : m_editor.RemoveKey(section, key);
-    if (result == zkINIEditor::Missing && m_args.Has(Arguments::Existing)) return NotFound(key);
+    if (result == zkINIEditor::Missing && m_args.Has(Arguments::Existing)) return NotFound(!wholeSection);
     m_change.append("delete [").append(section).append(']');
     if (!wholeSection) m_change.append(' ').append(key);
     return WriteResult(result == zkINIEditor::Done);
@@ -296,8 +306,8 @@ int Tool::Apply(const BatchChange& change) {
     if (m_args.Has(Arguments::Existing) && m_editor.GetVal(change.section, change.key, old) != zkINIEditor::Done)
         return zkINIEditor::Missing;
     // A new key counts as done here: the change was made.
-    return m_editor.SetVal(change.section, change.key, change.value) == zkINIEditor::Refused ? zkINIEditor::Refused
-                                                                                           : zkINIEditor::Done;
+    const int result = m_editor.SetVal(change.section, change.key, change.value);
+    return result == zkINIEditor::Refused ? result : zkINIEditor::Done;
 }
 
 int Tool::Batch() {
@@ -320,7 +330,7 @@ int Tool::Batch() {
         if (result == zkINIEditor::Done) {
             changed = true;
         } else if (result == zkINIEditor::Refused) {
-            return refused(joined({shown(path), " line ", number(change.line).data(), ": cannot be written"}));
+            return refused(joined({shown(path), " line ", number(change.line).data(), " cannot be written"}));
         } else if (m_args.Has(Arguments::Existing)) {
             if (!m_args.Has(Arguments::Quiet))
                 std::fprintf(stderr, "zkini: %s line %u: no such section or key\n", shown(path), change.line);
