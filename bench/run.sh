@@ -26,7 +26,7 @@ report=$build/bench-report.txt
 pairs=$(mktemp)
 trap 'rm -f "$pairs"; [ -z "$made" ] || rm -rf "$made"' EXIT
 
-for program in zk_strings_bench zk_cmdline_bench zk_ini_bench zk_list_bench zk_log_bench zk_copy_bench; do
+for program in zk_strings_bench zk_cmdline_bench zk_ini_bench zk_ini_editor_bench zk_list_bench zk_log_bench zk_copy_bench; do
   if [ ! -x "$build/bench/$program" ]; then
     echo "missing: $program (peer or Google Benchmark not installed?)" >&2
     continue

@@ -21,57 +21,34 @@
 #include <vector>
 
 #include "zkBenchPairs.h"
+#include "zkINIBenchFile.h"
 #include "zkMappedINIFile.h"
 
 extern char** environ;
 
 namespace {
 
-constexpr unsigned kSections = 2000;
-constexpr unsigned kKeysPerSection = 50;
-// A comment line stands before every this many keys.
-constexpr unsigned kCommentEvery = 10;
-constexpr unsigned kMinValueLength = 30;
-constexpr unsigned kValueLengthRange = 64;
-constexpr unsigned long long kSeed = 1234567;
+using zkbench::kINIKeysPerSection;
+using zkbench::kINISections;
+
 constexpr char kPeakOption[] = "--peak=";
 
 std::string g_source, g_saved;
 std::string g_lastSection, g_lastKey, g_lastValue;
 
-std::string word(zkbench::Random& random, unsigned length) {
-    std::string w;
-    for (unsigned i = 0; i < length; ++i) w += static_cast<char>('a' + random.below(26));
-    return w;
-}
-
 bool makeFile() {
-    zkbench::Random random(kSeed);
-    std::string text = "; generated for the INI benchmark\n\n";
-    for (unsigned s = 0; s < kSections; ++s) {
-        std::string section = "section" + std::to_string(s) + word(random, 4);
-        text += "[" + section + "]\n";
-        for (unsigned k = 0; k < kKeysPerSection; ++k) {
-            if (k % kCommentEvery == 0) text += "; " + word(random, 10) + " " + word(random, 20) + "\n";
-            std::string key = "key" + std::to_string(k) + "_" + word(random, 6);
-            std::string value;
-            unsigned length = kMinValueLength + random.below(kValueLengthRange);
-            while (value.size() < length) value += (value.empty() ? "" : " ") + word(random, 1 + random.below(9));
-            text += key + " = " + value + "\n";
-            g_lastSection = section;
-            g_lastKey = key;
-            g_lastValue = value;
-        }
-        text += "\n";
-    }
+    zkbench::INIBenchFile file = zkbench::makeINIBenchFile();
+    g_lastSection = file.lastSection;
+    g_lastKey = file.lastKey;
+    g_lastValue = file.lastValue;
     std::ofstream out(g_source, std::ios::binary | std::ios::trunc);
-    out << text;
-    std::fprintf(stderr, "INI file of %zu bytes\n", text.size());
+    out << file.text;
+    std::fprintf(stderr, "INI file of %zu bytes\n", file.text.size());
     return static_cast<bool>(out);
 }
 
 bool checkLibrary(zkMappedINIFile& ini) {
-    return ini.GetSectionList()->size() == kSections &&
+    return ini.GetSectionList()->size() == kINISections &&
            ini.GetVal(zkStringBase(g_lastSection.c_str()), zkStringBase(g_lastKey.c_str()))
                .equals(g_lastValue.c_str());
 }
@@ -80,7 +57,7 @@ bool checkSimpleIni(const CSimpleIniA& ini) {
     CSimpleIniA::TNamesDepend sections;
     ini.GetAllSections(sections);
     const char* value = ini.GetValue(g_lastSection.c_str(), g_lastKey.c_str());
-    return sections.size() == kSections && value && g_lastValue == value;
+    return sections.size() == kINISections && value && g_lastValue == value;
 }
 
 // The inih callback copies every key and value.
@@ -113,7 +90,7 @@ void parseInih(benchmark::State& state) {
     for (auto _ : state) {
         Copied copied;
         if (ini_parse(g_source.c_str(), copyEntry, &copied) != 0 ||
-            copied.entries.size() != kSections * kKeysPerSection || copied.entries.back().second != g_lastValue)
+            copied.entries.size() != kINISections * kINIKeysPerSection || copied.entries.back().second != g_lastValue)
             state.SkipWithError("wrong result");
     }
 }

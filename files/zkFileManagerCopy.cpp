@@ -2,13 +2,14 @@
 
 #include <errno.h>
 #include <fcntl.h>
-#include <stdlib.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <cstring>
 #include <string>
 #include <vector>
+
+#include "../internal/zkFileSystem.h"
 
 namespace {
 
@@ -18,15 +19,10 @@ constexpr unsigned kBlockSize = 16384;
 constexpr unsigned long long kKernelChunk = 1ull << 30;
 // The first buffer for a symbolic link's target; it doubles until the target fits.
 constexpr size_t kFirstLinkBuffer = 256;
-// GetFileSize hands back the high 32 bits of a size separately.
-constexpr int kHighShift = 32;
 
 constexpr unsigned kReadAccess = 0444;
-constexpr unsigned kWriteAccess = 0222;
-constexpr unsigned kCreatedMode = 0664;
-constexpr mode_t kPermissionBits = 07777;
-// The file beside an overwritten destination that receives the new copy.
-constexpr const char* kTemporarySuffix = ".zkcopy-XXXXXX";
+// A new copy's mode, less the umask and the bits its source lacks.
+constexpr mode_t kCreatedMode = 0664;
 
 constexpr char kSeparator = '/';
 constexpr const char* kAllEntries = "*";
@@ -100,71 +96,35 @@ bool copyData(int in, int out, unsigned long long size) {
     return true;
 }
 
-// The copy of one regular file, from opening both ends to removing the
-// source of a move.
-int copyContents(zkFilename& source, zkFilename& destination, const Options& options) {
+// Opens the source of a file copy; -1 when it is no regular file or the
+// destination is the source itself under another name, or a FIFO, whose
+// open would wait for a reader.
+int openSource(zkFilename& source, zkFilename& destination, struct stat& from) {
     int in = CreateFile(source.m_path, O_RDONLY, kReadAccess, 0, 0, kCreatedMode, nullptr);
-    if (in == -1) return 1;
-    struct stat from, to;
+    if (in == -1) return -1;
+    struct stat to;
     bool refused = fstat(in, &from) != 0 || !S_ISREG(from.st_mode);
-    // Opening the destination truncates it, so a destination that is the
-    // source under another name is caught before, and so is a FIFO, whose
-    // open would wait for a reader.
     if (!refused && stat(destination.GetFullPath(), &to) == 0) refused = sameFile(from, to) || S_ISFIFO(to.st_mode);
-    if (refused) {
-        CloseHandle(in);
-        return 1;
-    }
-    // An existing regular file that is overwritten is replaced only once the
-    // new copy is whole: the data goes to a file beside it, which takes the
-    // old file's mode and owner and is renamed over it. A failed copy leaves
-    // the old file as it was. Links and devices are written through, and so
-    // is a file in a directory where no new file can be made.
-    struct stat old;
-    bool replace = options.overwrite && lstat(destination.GetFullPath(), &old) == 0 && S_ISREG(old.st_mode);
-    std::string temporary;
-    int out = -1;
-    if (replace) {
-        temporary = std::string(destination.GetFullPath()) + kTemporarySuffix;
-        out = mkostemp(&temporary[0], O_CLOEXEC);
-        if (out != -1 && (fchmod(out, old.st_mode & kPermissionBits) != 0 ||
-                          (fchown(out, old.st_uid, old.st_gid) != 0 && errno != EPERM))) {
-            CloseHandle(out);
-            unlink(temporary.c_str());
-            out = -1;
-        }
-        replace = out != -1;
-    }
-    if (!replace) {
-        out = CreateFile(destination.m_path, O_CREAT | O_WRONLY, kWriteAccess, 0,
-                         options.overwrite ? O_TRUNC : O_EXCL, kCreatedMode, nullptr);
-    }
-    if (out == -1) {
-        CloseHandle(in);
-        return 1;
-    }
-
-    unsigned high = 0;
-    unsigned low = GetFileSize(in, &high);
-    unsigned long long size = (static_cast<unsigned long long>(high) << kHighShift) | low;
-    bool complete = copyData(in, out, size);
-    // The source of a move, or the file being replaced, goes only once its
-    // copy is on disk.
-    if (complete && (options.deleteSource || replace)) complete = fsync(out) == 0;
-    // Only a regular file is removed after a failure: a device written to
-    // stays where it is.
-    bool removable = fstat(out, &to) == 0 && S_ISREG(to.st_mode);
-    if (!CloseHandle(out)) complete = false;
+    if (!refused) return in;
     CloseHandle(in);
+    return -1;
+}
 
-    if (replace) {
-        if (complete) complete = rename(temporary.c_str(), destination.GetFullPath()) == 0;
-        if (!complete) unlink(temporary.c_str());
-        if (!complete) return 1;
-    } else if (!complete) {
-        if (removable) unlink(destination.GetFullPath());
-        return 1;
-    }
+// The copy of one regular file. An overwritten destination is replaced only
+// once the new copy is whole, keeping its mode and owner; a new one is never
+// more open than its source. The source of a move goes only once its copy is
+// on disk.
+int copyContents(zkFilename& source, zkFilename& destination, const Options& options) {
+    struct stat from;
+    int in = openSource(source, destination, from);
+    if (in == -1) return 1;
+    const unsigned long long size = static_cast<unsigned long long>(from.st_size);
+    const mode_t mode = kCreatedMode & from.st_mode;
+    auto copy = [in, size](int out) { return copyData(in, out, size); };
+    int failed = options.overwrite ? zkReplaceFile(destination.GetFullPath(), mode, size, copy)
+                                   : zkCreateNewFile(destination.GetFullPath(), mode, options.deleteSource != 0, copy);
+    CloseHandle(in);
+    if (failed) return 1;
     if (options.deleteSource && unlink(source.GetFullPath()) != 0) return 1;
     return 0;
 }

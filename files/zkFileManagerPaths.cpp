@@ -50,6 +50,13 @@ void walk(zkStringBase& result, const zkStringBase& name) {
 
 void zkFileManager::MakePath(zkStringBase& result, const zkStringBase& dir, const zkStringBase& name,
                              unsigned noTrailing) {
+    // The result is built in place, so a name that is the result itself is
+    // read from a copy.
+    if (&result == &name) {
+        const zkStringBase copy(name);
+        MakePath(result, dir, copy, noTrailing);
+        return;
+    }
     result = dir;
     if (result.isNull()) {
         result = m_slash;
@@ -82,6 +89,11 @@ void zkFileManager::MakePath(zkStringBase& result, const zkStringBase& dir, cons
 
 void zkFileManager::MakePath(zkStringBase& result, const zkStringBase& dir, const zkStringBase& subdir,
                              const zkStringBase& file) {
+    if (&result == &file) {
+        const zkStringBase copy(file);
+        MakePath(result, dir, subdir, copy);
+        return;
+    }
     MakePath(result, dir, subdir, 0u);
     if (file.isNull()) return;
     unsigned skip = isSeparator(file[0]) ? 1 : 0;

@@ -64,13 +64,20 @@ public:
     /// part takes source's name and extension (dir/ gives dir/a.txt). A
     /// destination that names source itself, by the same path ignoring case
     /// or as the same file through links or "." and "..", gives 1 and changes
-    /// nothing. An existing destination is replaced when overwrite is nonzero
-    /// and left alone with result 1 when it is 0; a created file gets mode
-    /// 0664 less the umask. A copy that cannot finish (a read or write error,
-    /// a source that ends early, an error on closing) removes the partial
-    /// destination, keeps source and gives 1. With deleteSource nonzero a
-    /// completed copy is flushed to disk and then source is removed; 1 when
-    /// that fails.
+    /// nothing. An existing destination is left alone with result 1 when
+    /// overwrite is 0. When it is nonzero, an existing regular file is
+    /// replaced only once the copy is whole (written beside it, flushed and
+    /// renamed over it, or, where its directory admits no new file, rewritten
+    /// in place with the old bytes put back on failure): it keeps its mode,
+    /// set-id bits included, and where the process may its owner; through a
+    /// symbolic link the link's final target is replaced and the link stays;
+    /// a device is written through. A created file gets mode 0664 less the
+    /// umask and less any permission its source lacks. A copy that cannot
+    /// finish (a read or write error, a source that ends early, an error on
+    /// closing) leaves an overwritten destination as it was, removes a
+    /// created one, keeps source and gives 1, with errno telling why. With
+    /// deleteSource nonzero a completed copy is flushed to disk and then
+    /// source is removed; 1 when that fails.
     ///
     /// Directory copy: destination is made as a directory (with any missing
     /// parents) and each matching entry except "." and ".." is copied into

@@ -27,9 +27,10 @@
 /// which is flushed to disk and renamed over the old one, so a failed save
 /// leaves the old file as it was. The new file keeps the old one's permission
 /// bits and, where the process may, its owner; through a symbolic link the
-/// link's target is replaced. Where the directory admits no new file, and for
-/// a device or other file that is not a regular file, the file is rewritten
-/// in place instead.
+/// link's target is replaced. Where the directory admits no new file, a
+/// writable file is rewritten in place, its old bytes read first and put
+/// back if a write fails; a device or other file that is not a regular file
+/// is written through.
 ///
 /// The document owns its sections, each section its line list and lines;
 /// pointers and references handed out stay valid until that entry is
@@ -119,10 +120,12 @@ public:
     /// Nonzero: replaces the file with the document's text and then empties
     /// the document, returning 0; returns 1 and keeps the document when it
     /// could not be saved (the file untouched), or when a name, key or value
-    /// holds a CR or LF, which would read back as lines of their own.
+    /// holds a CR or LF, which would read back as lines of their own; errno
+    /// then tells why (EINVAL for a line break).
     virtual int Close(unsigned int save);
     /// As Close, but in the section named exactly "IPsBehindFirewall" each
-    /// key line is written as the key directly followed by the value.
+    /// key line is written as the key directly followed by the value (a
+    /// comment line of one character is padded as Close pads it).
     virtual int CloseFW(unsigned int save);
 
     /// The document's own section list, in document order.
@@ -174,8 +177,6 @@ private:
     int Save(bool firewall);
     /// Whether a name, key or value holds a CR or LF.
     bool HasLineBreaks() const;
-    /// Appends the sections found in text.
-    void Parse(const zkStringBase& text);
 
     std::list<INISection*> m_sections;
     zkStringBase m_filename;

@@ -8,6 +8,8 @@
 
 #include <string>
 
+#include "../../internal/zkFileSystem.h"
+
 namespace {
 
 constexpr char kSeparator = '/';
@@ -45,11 +47,7 @@ int zkUnlink(const char* path, unsigned flag) {
 
 int CreateFile(const char* path, unsigned flags, unsigned, unsigned, unsigned creation, unsigned mode, void*) {
     if (path == nullptr) return -1;
-    int fd;
-    do {
-        fd = open(path, static_cast<int>(flags | creation) | O_CLOEXEC, static_cast<mode_t>(mode));
-    } while (fd == -1 && errno == EINTR);
-    return fd;
+    return zkOpen(path, static_cast<int>(flags | creation), static_cast<mode_t>(mode));
 }
 
 int ReadFile(int handle, void* buffer, unsigned count, unsigned* done, void*) {

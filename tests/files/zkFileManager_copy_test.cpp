@@ -63,6 +63,23 @@ TEST(FileManagerCopy, SingleFileNamesOverwriteSameFileAndMove) {
     EXPECT_FALSE(exists(a) || exists(dir.file("A.TXT")) || exists(dir.file("n")));
 }
 
+// A new copy is never more open than its source.
+TEST(FileManagerCopy, NewCopyTakesTheSourcesPermissionsAtMost) {
+    zkTempDir dir;
+    const mode_t mask = umask(0);
+    for (mode_t mode : {0600u, 0755u, 0666u}) {
+        SCOPED_TRACE(mode);
+        const std::string source = dir.file("s" + std::to_string(mode)), copy = source + ".copy";
+        ASSERT_TRUE(zkWriteFile(source, "x"));
+        ASSERT_EQ(0, chmod(source.c_str(), mode));
+        EXPECT_EQ(0, copyFile(source, copy));
+        struct stat st;
+        ASSERT_EQ(0, stat(copy.c_str(), &st));
+        EXPECT_EQ(mode & 0664u, st.st_mode & 07777u);
+    }
+    umask(mask);
+}
+
 TEST(FileManagerCopy, FailedCopyKeepsTheSourceAndLeavesNoPartialDestination) {
     zkTempDir dir;
     std::string a = dir.file("a.txt"), big(40000, 'b');

@@ -31,6 +31,17 @@ TEST(MakePath, JoinsDirectoryAndName) {
     EXPECT_STREQ("/x/a\\..\\b", path.data());
 }
 
+// The result may be the same string as any argument.
+TEST(MakePath, ResultMayBeAnArgument) {
+    zkStringBase dir("/a"), name("b"), file("f");
+    zkFileManager::MakePath(dir, dir, name, 1u);
+    EXPECT_STREQ("/a/b", dir.data());
+    zkFileManager::MakePath(name, dir, name, 1u);
+    EXPECT_STREQ("/a/b/b", name.data());
+    zkFileManager::MakePath(file, zkStringBase("/d"), zkStringBase("s"), file);
+    EXPECT_STREQ("/d/s/f", file.data());
+}
+
 TEST(MakePath, InsertsTheChosenSeparator) {
     zkFileManager::m_slash = '\\';
     const std::string windows = joined("C:/a", "b", 0), root = joined("", "..", 1);

@@ -29,32 +29,6 @@ std::string versionText(char tag, int sections) {
 
 }  // namespace
 
-TEST(IniFault, FileSizeLimitAtEveryOffsetKeepsTheOldFile) {
-    zkTempDir dir;
-    const std::string path = dir.file("a.ini");
-    const std::string old = "[old]\nk=v\n\n";
-    const std::string text = versionText('n', 4);
-    ASSERT_TRUE(zkWriteFile(path, old));
-    zkMappedINIFile ini;
-    ASSERT_EQ(0, zkLoad(ini, dir, "new.ini", text));
-    unlink(dir.file("new.ini").c_str());
-    ini.SetFilename(path.c_str());
-    const std::string kept = zkDump(ini);
-
-    for (size_t limit = 0; limit < text.size(); ++limit) {
-        int result = 0;
-        ASSERT_TRUE(zkWithFileSizeLimit(limit, [&] { result = ini.Close(1); }));
-        ASSERT_EQ(1, result) << limit;
-        ASSERT_EQ(old, zkReadFile(path)) << limit;
-        ASSERT_EQ(1u, zkDirEntries(dir.path()).size()) << limit;
-        ASSERT_EQ(kept, zkDump(ini)) << limit;
-    }
-    int result = 1;
-    ASSERT_TRUE(zkWithFileSizeLimit(text.size(), [&] { result = ini.Close(1); }));
-    EXPECT_EQ(0, result);
-    EXPECT_EQ(text, zkReadFile(path));
-}
-
 TEST(IniFault, ConcurrentSaversAndLoadersSeeWholeDocuments) {
     constexpr int kSaves = 60;
     constexpr int kLoads = 400;

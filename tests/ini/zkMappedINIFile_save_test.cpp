@@ -21,10 +21,11 @@ struct stat statOf(const std::string& path) {
 }  // namespace
 
 // Only the section named exactly "IPsBehindFirewall", or by a
-// case-insensitive string, loses its "=" in the firewall form.
+// case-insensitive string, loses its "=" in the firewall form; a lone
+// comment character keeps its padding blank in both forms.
 TEST(IniSave, WrittenForms) {
     const std::string head = "[Servers]\nalpha=10.0.0.1\nbeta=\n; spare\n\n[IPsBehindFirewall]\n";
-    const std::string tail = "\n; trusted\n\n[ipsbehindfirewall]\nlower=1\n\n";
+    const std::string tail = "\n; trusted\n; \n\n[ipsbehindfirewall]\nlower=1\n\n";
     zkTempDir dir;
     const std::string path = dir.file("a.ini");
     for (bool firewallForm : {false, true}) {
