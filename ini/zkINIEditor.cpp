@@ -64,7 +64,8 @@ void zkINIEditor::Impl::clear() {
 zkINIEditorLine zkINIEditor::Impl::record(const char* begin, const char* contentEnd, const char* next) const {
     zkINILine found;
     zkClassifyINILine(begin, contentEnd, found);
-    Line line = {begin, offset(begin, contentEnd), static_cast<unsigned char>(next - contentEnd), found.kind, false, 0, 0, 0, 0};
+    const auto endLength = static_cast<unsigned char>(next - contentEnd);
+    Line line = {begin, offset(begin, contentEnd), endLength, found.kind, false, 0, 0, 0, 0};
     if (found.kind == zkINILine::Ignored) return line;
     line.name = offset(begin, found.name);
     line.nameLength = offset(found.name, found.nameEnd);
@@ -127,8 +128,8 @@ int zkINIEditor::Impl::findKey(const Section& section, const zkStringBase& key) 
 
 // ---- Changes ----
 
-zkINIEditorLine zkINIEditor::Impl::makeLine(std::initializer_list<std::pair<const char*, unsigned>> pieces, const char* end,
-                          unsigned endLength) {
+zkINIEditorLine zkINIEditor::Impl::makeLine(std::initializer_list<std::pair<const char*, unsigned>> pieces,
+                                            const char* end, unsigned endLength) {
     size_t length = 0;
     for (const auto& piece : pieces) length += piece.second;
     std::unique_ptr<char[]> bytes(new char[length + endLength]);

@@ -49,6 +49,10 @@ bool sameFile(const struct stat& a, const struct stat& b) {
 bool readAll(int fd, std::unique_ptr<char[]>& bytes, size_t& size) {
     struct stat st;
     if (fstat(fd, &st) != 0) return false;
+    if (static_cast<unsigned long long>(st.st_size) > kMaxTextLength) {
+        errno = EFBIG;
+        return false;
+    }
     // The size is a first guess: the file may grow while it is read.
     size_t room = static_cast<size_t>(st.st_size) + 1;
     bytes.reset(new char[room]);
@@ -85,7 +89,7 @@ bool waitForLock(int fd, Clock::time_point deadline) {
             errno = EWOULDBLOCK;
             return false;
         }
-        struct timespec nap = {0, left < pause ? left : pause};
+        struct timespec nap = {0, left < pause ? static_cast<long>(left) : pause};
         nanosleep(&nap, nullptr);
         if (pause < kLongestPauseNs) pause *= 2;
     }

@@ -35,7 +35,9 @@ struct zkINIEditorSection {
     zkINIEditorLines lines;
 };
 
-struct zkINIEditor::Impl {
+// Hidden, unlike the exported class it belongs to: nothing of it is part of
+// the library's interface.
+struct __attribute__((visibility("hidden"))) zkINIEditor::Impl {
     using Line = zkINIEditorLine;
     using Lines = zkINIEditorLines;
     using Section = zkINIEditorSection;

@@ -33,6 +33,18 @@ std::vector<std::string> texts(const std::list<zkStringBase>& names, const char*
     return out;
 }
 
+// Loads text into an editor, runs change on it and returns the text it then
+// holds; result receives change's result.
+template <class Change>
+std::string afterChange(const std::string& text, int& result, Change change) {
+    zkINIEditor editor;
+    editor.Load(text.data(), text.size());
+    result = change(editor);
+    zkStringBase out;
+    editor.GetText(out);
+    return zkText(out);
+}
+
 }  // namespace
 
 // Each row changes one file through a locked editor and expects the file's
@@ -158,15 +170,16 @@ TEST(IniEditor, RefusesTextThatWouldNotReadBack) {
     const std::string original = zkTestData("crlf.ini");
     for (const auto& row : rows) {
         SCOPED_TRACE(std::string(row.section) + "/" + row.key + "/" + row.value);
-        zkINIEditor editor;
-        editor.Load(original.data(), original.size());
-        EXPECT_EQ(row.result, editor.SetVal(zkStr(row.section), zkStr(row.key), zkStr(row.value)));
-        zkStringBase text, value("<missing>");
-        editor.GetText(text);
+        int result = 0;
+        const std::string text = afterChange(original, result, [&](zkINIEditor& e) {
+            return e.SetVal(zkStr(row.section), zkStr(row.key), zkStr(row.value));
+        });
+        EXPECT_EQ(row.result, result);
         const bool refused = row.result == zkINIEditor::Refused;
-        EXPECT_EQ(refused, zkText(text) == original);
+        EXPECT_EQ(refused, text == original);
         zkINIEditor reread;
-        reread.Load(text.data(), text.length());
+        reread.Load(text.data(), text.size());
+        zkStringBase value("<missing>");
         reread.GetVal(zkStr(row.section), zkStr(row.key), value);
         EXPECT_EQ(refused ? "<missing>" : row.value, zkText(value));
     }
@@ -190,12 +203,10 @@ TEST(IniEditor, RemoveSectionTakesItsLinesUpToTheNextHeader) {
     };
     for (const auto& row : rows) {
         SCOPED_TRACE(row.text);
-        zkINIEditor editor;
-        editor.Load(row.text, std::string(row.text).size());
-        EXPECT_EQ(row.result, editor.RemoveSection(zkStr(row.section)));
-        zkStringBase text;
-        editor.GetText(text);
-        EXPECT_EQ(row.left, zkText(text));
+        int result = 0;
+        EXPECT_EQ(row.left,
+                  afterChange(row.text, result, [&](zkINIEditor& e) { return e.RemoveSection(zkStr(row.section)); }));
+        EXPECT_EQ(row.result, result);
     }
 }
 
@@ -217,12 +228,11 @@ TEST(IniEditor, NewLinesTakeTheFilesLineEnds) {
     };
     for (const auto& row : rows) {
         SCOPED_TRACE(row.text);
-        zkINIEditor editor;
-        editor.Load(row.text, std::string(row.text).size());
-        EXPECT_EQ(zkINIEditor::Missing, editor.SetVal(zkStr(row.section), zkStr("k"), zkStr("v")));
-        zkStringBase text;
-        editor.GetText(text);
-        EXPECT_EQ(row.expected, zkText(text));
+        int result = 0;
+        EXPECT_EQ(row.expected, afterChange(row.text, result, [&](zkINIEditor& e) {
+                      return e.SetVal(zkStr(row.section), zkStr("k"), zkStr("v"));
+                  }));
+        EXPECT_EQ(zkINIEditor::Missing, result);
     }
 }
 
@@ -241,12 +251,10 @@ TEST(IniEditor, MergeSetsEveryKeyOrNone) {
     };
     for (const auto& row : rows) {
         SCOPED_TRACE(row.other);
-        zkINIEditor editor, other;
-        editor.Load(original.data(), original.size());
+        zkINIEditor other;
         other.Load(row.other, std::string(row.other).size());
-        EXPECT_EQ(row.result, editor.MergeFrom(other));
-        zkStringBase text;
-        editor.GetText(text);
-        EXPECT_EQ(row.expected, zkText(text));
+        int result = 0;
+        EXPECT_EQ(row.expected, afterChange(original, result, [&](zkINIEditor& e) { return e.MergeFrom(other); }));
+        EXPECT_EQ(row.result, result);
     }
 }
