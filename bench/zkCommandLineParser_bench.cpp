@@ -99,8 +99,7 @@ int main(int argc, char** argv) {
     zkbench::MedianReporter reporter;
     zkbench::runInterleaved(argc, argv, reporter);
     // Work in memory: the pair compares CPU time.
-    zkbench::printPair(reporter, "ParseCmdLine", "parseLibrary", "parseUnorderedMap", "us", 2.0,
-                       zkbench::Clock::Cpu);
+    zkbench::printPair(reporter, "ParseCmdLine", "parseLibrary", "parseUnorderedMap", "us", 2.0, zkbench::Clock::Cpu);
     benchmark::Shutdown();
     return 0;
 }

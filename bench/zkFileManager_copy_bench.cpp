@@ -32,7 +32,8 @@ bool makeSource() {
     out.close();
     // Read once, so every run finds the source in the page cache.
     std::ifstream in(g_source, std::ios::binary);
-    while (in.read(chunk.data(), chunk.size())) {}
+    while (in.read(chunk.data(), chunk.size())) {
+    }
     return static_cast<bool>(out);
 }
 
@@ -70,7 +71,11 @@ void copyWithCp(benchmark::State& state) {
     state.SetBytesProcessed(static_cast<long long>(state.iterations() * kFileSize));
 }
 
-BENCHMARK(copyWithLibrary)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(copyWithLibrary)
+    ->Iterations(1)
+    ->Repetitions(zkbench::kRepetitions)
+    ->UseRealTime()
+    ->Unit(benchmark::kMillisecond);
 BENCHMARK(copyWithCp)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond);
 
 }  // namespace

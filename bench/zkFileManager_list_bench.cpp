@@ -78,9 +78,12 @@ size_t listPlain(const char* path, const char* extension, Record** out) {
             room = room ? 2 * room : 64;
             records = static_cast<Record*>(std::realloc(records, room * sizeof *records));
         }
-        records[count++] = Record{strdup(entry->d_name), static_cast<unsigned long long>(st.st_size),
-                                  static_cast<long long>(st.st_ctime), static_cast<long long>(st.st_atime),
-                                  static_cast<long long>(st.st_mtime), static_cast<unsigned>(st.st_mode)};
+        records[count++] = Record{strdup(entry->d_name),
+                                  static_cast<unsigned long long>(st.st_size),
+                                  static_cast<long long>(st.st_ctime),
+                                  static_cast<long long>(st.st_atime),
+                                  static_cast<long long>(st.st_mtime),
+                                  static_cast<unsigned>(st.st_mode)};
     }
     closedir(dir);
     *out = records;
@@ -105,8 +108,16 @@ void listReaddirStat(benchmark::State& state) {
     }
 }
 
-BENCHMARK(listLibrary)->Repetitions(zkbench::kRepetitions)->ReportAggregatesOnly()->UseRealTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(listReaddirStat)->Repetitions(zkbench::kRepetitions)->ReportAggregatesOnly()->UseRealTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(listLibrary)
+    ->Repetitions(zkbench::kRepetitions)
+    ->ReportAggregatesOnly()
+    ->UseRealTime()
+    ->Unit(benchmark::kMillisecond);
+BENCHMARK(listReaddirStat)
+    ->Repetitions(zkbench::kRepetitions)
+    ->ReportAggregatesOnly()
+    ->UseRealTime()
+    ->Unit(benchmark::kMillisecond);
 
 }  // namespace
 

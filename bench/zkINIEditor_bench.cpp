@@ -48,7 +48,8 @@ void documentOpenClose(benchmark::State& state) {
     }
 }
 
-#define ZK_BENCH(f) BENCHMARK(f)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond)
+#define ZK_BENCH(f) \
+    BENCHMARK(f)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond)
 ZK_BENCH(editorSetOneKey);
 ZK_BENCH(documentOpenClose);
 

@@ -65,8 +65,8 @@ void logPlainC(benchmark::State& state) {
             time_t now = time(nullptr);
             struct tm local;
             localtime_r(&now, &local);
-            int n = std::snprintf(line, sizeof line, "%02d:%02d:%02d %02d/%02d/%02d  %s\n", local.tm_hour,
-                                  local.tm_min, local.tm_sec, local.tm_mon + 1, local.tm_mday, local.tm_year % 100,
+            int n = std::snprintf(line, sizeof line, "%02d:%02d:%02d %02d/%02d/%02d  %s\n", local.tm_hour, local.tm_min,
+                                  local.tm_sec, local.tm_mon + 1, local.tm_mday, local.tm_year % 100,
                                   g_messages[k % kMessages].c_str());
             int fd = open(g_peer.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0666);
             if (fd == -1) continue;

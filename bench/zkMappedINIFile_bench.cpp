@@ -49,8 +49,7 @@ bool makeFile() {
 
 bool checkLibrary(zkMappedINIFile& ini) {
     return ini.GetSectionList()->size() == kINISections &&
-           ini.GetVal(zkStringBase(g_lastSection.c_str()), zkStringBase(g_lastKey.c_str()))
-               .equals(g_lastValue.c_str());
+           ini.GetVal(zkStringBase(g_lastSection.c_str()), zkStringBase(g_lastKey.c_str())).equals(g_lastValue.c_str());
 }
 
 bool checkSimpleIni(const CSimpleIniA& ini) {
@@ -120,7 +119,8 @@ void saveSimpleIni(benchmark::State& state) {
     }
 }
 
-#define ZK_BENCH(f) BENCHMARK(f)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond)
+#define ZK_BENCH(f) \
+    BENCHMARK(f)->Iterations(1)->Repetitions(zkbench::kRepetitions)->UseRealTime()->Unit(benchmark::kMillisecond)
 ZK_BENCH(openLibrary);
 ZK_BENCH(loadSimpleIni);
 ZK_BENCH(parseInih);

@@ -23,12 +23,12 @@ constexpr unsigned kMaxTokenLength = 12;
 constexpr unsigned long long kSeed = 20240601;
 
 struct Input {
-    std::string text;          // lower-case letters and spaces
-    std::string absent;        // a pattern that does not occur
-    std::string nearEnd;       // a pattern whose first occurrence is near the end
+    std::string text;     // lower-case letters and spaces
+    std::string absent;   // a pattern that does not occur
+    std::string nearEnd;  // a pattern whose first occurrence is near the end
     size_t nearEndAt = 0;
     std::string absentUpper, nearEndUpper;  // the same in capitals
-    std::string tokens;        // comma-separated short tokens
+    std::string tokens;                     // comma-separated short tokens
     size_t tokenCount = 0;
     zkStringBase zText, zCopy, zAbsent, zNearEnd, zAbsentUpper, zNearEndUpper, zTokens;
 };
@@ -181,7 +181,8 @@ void tokenizeStringView(benchmark::State& state) {
     }
 }
 
-#define ZK_BENCH(f) BENCHMARK(f)->Repetitions(zkbench::kRepetitions)->ReportAggregatesOnly()->Unit(benchmark::kMicrosecond)
+#define ZK_BENCH(f) \
+    BENCHMARK(f)->Repetitions(zkbench::kRepetitions)->ReportAggregatesOnly()->Unit(benchmark::kMicrosecond)
 ZK_BENCH(findAbsentLibrary);
 ZK_BENCH(findAbsentStd);
 ZK_BENCH(findNearEndLibrary);

@@ -6,9 +6,9 @@
 #include <unordered_map>
 #include <utility>
 
-#include "../internal/zkCaseTables.h"
-#include "../internal/zkCharRules.h"
-#include "../internal/zkOutOfMemory.h"
+#include "internal/zkCaseTables.h"
+#include "internal/zkCharRules.h"
+#include "internal/zkOutOfMemory.h"
 
 namespace {
 

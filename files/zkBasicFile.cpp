@@ -7,7 +7,7 @@
 #include <cerrno>
 #include <cstring>
 
-#include "../internal/zkStringRules.h"
+#include "internal/zkStringRules.h"
 #include "zkStringBase.h"
 
 static_assert(sizeof(off_t) == 8, "file offsets must be 64-bit: build with _FILE_OFFSET_BITS=64");
@@ -30,8 +30,7 @@ zkBasicFile::zkBasicFile()
     m_filename[0] = '\0';
 }
 
-zkBasicFile::zkBasicFile(const char* filename, unsigned long creation, unsigned long access,
-                         unsigned long extraFlags)
+zkBasicFile::zkBasicFile(const char* filename, unsigned long creation, unsigned long access, unsigned long extraFlags)
     : m_creation(static_cast<unsigned>(creation)),
       m_access(static_cast<unsigned>(access)),
       m_extraFlags(static_cast<unsigned>(extraFlags)),

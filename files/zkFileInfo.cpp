@@ -44,6 +44,6 @@ zkFileInfo& zkFileInfo::operator=(const zkFileInfo& other) {
 }
 
 bool zkFileInfo::operator==(const zkFileInfo& other) const {
-    return m_file == other.m_file && m_size == other.m_size && m_ctime == other.m_ctime &&
-           m_atime == other.m_atime && m_mtime == other.m_mtime && m_mode == other.m_mode;
+    return m_file == other.m_file && m_size == other.m_size && m_ctime == other.m_ctime && m_atime == other.m_atime &&
+           m_mtime == other.m_mtime && m_mode == other.m_mode;
 }

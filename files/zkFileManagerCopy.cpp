@@ -10,8 +10,8 @@
 #include <string>
 #include <vector>
 
-#include "../internal/zkFileSystem.h"
-#include "../internal/zkPathRules.h"
+#include "internal/zkFileSystem.h"
+#include "internal/zkPathRules.h"
 
 namespace {
 
@@ -49,10 +49,6 @@ int copyEntries(zkFilename& source, zkFilename& destination, const Options& opti
 
 bool hasWildcard(const char* path) {
     return std::strpbrk(path, "*?") != nullptr;
-}
-
-bool sameFile(const struct stat& a, const struct stat& b) {
-    return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
 }
 
 bool isReadableDirectory(const std::string& path) {
@@ -112,7 +108,7 @@ int openSource(zkFilename& source, zkFilename& destination, struct stat& from) {
     if (in == -1) return -1;
     struct stat to;
     bool refused = fstat(in, &from) != 0 || !S_ISREG(from.st_mode);
-    if (!refused && stat(destination.GetFullPath(), &to) == 0) refused = sameFile(from, to) || S_ISFIFO(to.st_mode);
+    if (!refused && stat(destination.GetFullPath(), &to) == 0) refused = zkSameFile(from, to) || S_ISFIFO(to.st_mode);
     if (!refused) return in;
     CloseHandle(in);
     return -1;
@@ -184,7 +180,7 @@ int copyLink(const std::string& from, const std::string& to, const Options& opti
 
     struct stat old, link;
     if (options.overwrite && lstat(to.c_str(), &old) == 0 && !S_ISDIR(old.st_mode)) {
-        if (lstat(from.c_str(), &link) != 0 || sameFile(old, link) || unlink(to.c_str()) != 0) return 1;
+        if (lstat(from.c_str(), &link) != 0 || zkSameFile(old, link) || unlink(to.c_str()) != 0) return 1;
     }
     if (symlink(target.data(), to.c_str()) != 0) return 1;
     if (options.deleteSource && unlink(from.c_str()) != 0) return 1;

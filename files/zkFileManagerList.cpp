@@ -8,8 +8,8 @@
 #include <cstring>
 #include <new>
 
-#include "../internal/zkOutOfMemory.h"
-#include "../internal/zkPathRules.h"
+#include "internal/zkOutOfMemory.h"
+#include "internal/zkPathRules.h"
 
 namespace {
 
@@ -83,8 +83,7 @@ void listFolders(int fd, const zkStringBase& root, const zkStringBase& relative,
 
 }  // namespace
 
-int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<zkFileInfo>& files,
-                               unsigned fullPaths) {
+int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<zkFileInfo>& files, unsigned fullPaths) {
     zkFilename filter(nullptr);
     zkFilename::Dup(&filter.m_dir, dir, -1);
     filter.Rebuild(0, 0, 0, 0, 0);

@@ -2,8 +2,8 @@
 // again: the second document equals the first whenever the first stays
 // within what the written form can carry. A document the writer must refuse
 // (a line break inside a value) gives 1 and leaves the file alone.
-#include <string.h>
 #include <stdlib.h>
+#include <string.h>
 #include <unistd.h>
 
 #include <vector>

@@ -39,7 +39,6 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     zkStringBase translated(file);
     zkFileManager::TranslatePathSeparators(translated, 0);
     ZK_FUZZ_CHECK(translated.length() == file.length());
-    for (unsigned i = 0; i < file.length(); ++i)
-        ZK_FUZZ_CHECK(translated[i] == (file[i] == '\\' ? '/' : file[i]));
+    for (unsigned i = 0; i < file.length(); ++i) ZK_FUZZ_CHECK(translated[i] == (file[i] == '\\' ? '/' : file[i]));
     return 0;
 }

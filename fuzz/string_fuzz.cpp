@@ -217,8 +217,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
                 (in.byte() & 1 ? 0x001 : 0) | (in.byte() & 1 ? 0x010 : 0) | (in.byte() & 1 ? 0x100 : 0));
             z.stripWhite(bits);
             size_t b = 0, e = m.size();
-            if (bits & 0x001) while (b < e && isSpace(m[b])) ++b;
-            if (bits & 0x010) while (e > b && isSpace(m[e - 1])) --e;
+            if (bits & 0x001)
+                while (b < e && isSpace(m[b])) ++b;
+            if (bits & 0x010)
+                while (e > b && isSpace(m[e - 1])) --e;
             m = m.substr(b, e - b);
             if (bits & 0x100) {
                 std::string kept;

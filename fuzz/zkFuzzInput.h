@@ -37,12 +37,12 @@ private:
 };
 
 // Stops the run with a message; libFuzzer records the input as a crash.
-#define ZK_FUZZ_CHECK(cond)                                                  \
-    do {                                                                     \
-        if (!(cond)) {                                                       \
+#define ZK_FUZZ_CHECK(cond)                                                          \
+    do {                                                                             \
+        if (!(cond)) {                                                               \
             fprintf(stderr, "%s:%d: check failed: %s\n", __FILE__, __LINE__, #cond); \
-            abort();                                                         \
-        }                                                                    \
+            abort();                                                                 \
+        }                                                                            \
     } while (0)
 
 #endif

@@ -34,7 +34,7 @@ public:
     bool operator==(const zkFileInfo& other) const;
     bool operator!=(const zkFileInfo& other) const { return !(*this == other); }
 
-    zkFilename m_file;  ///< the file's name and extension
+    zkFilename m_file;          ///< the file's name and extension
     unsigned long long m_size;  ///< size in bytes (st_size)
     long long m_ctime;          ///< last status change, seconds since the epoch (st_ctime)
     long long m_atime;          ///< last access (st_atime)

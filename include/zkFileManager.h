@@ -34,8 +34,7 @@ public:
     /// kept whole, and each leading "../" step removes the last component of
     /// dir, stopping at the root; the root is "/" in both forms. Backslashes
     /// become m_slash at the end.
-    static void MakePath(zkStringBase& result, const zkStringBase& dir, const zkStringBase& name,
-                         unsigned noTrailing);
+    static void MakePath(zkStringBase& result, const zkStringBase& dir, const zkStringBase& name, unsigned noTrailing);
     /// result becomes the directory path MakePath(result, dir, subdir, 0)
     /// followed by file (without its leading separator, otherwise unchanged).
     static void MakePath(zkStringBase& result, const zkStringBase& dir, const zkStringBase& subdir,

@@ -114,7 +114,8 @@ public:
     /// Reads the file and appends its sections after those already held.
     /// create 0: the file must exist and be writable; nonzero: it is opened
     /// read-only and created empty when missing. Returns 0 when loaded, 1 when
-    /// the file cannot be opened or read (the document is then unchanged).
+    /// the file cannot be opened or read (the document is then unchanged;
+    /// errno tells why).
     virtual int Open(unsigned int create);
     /// save 0: empties the document and returns 0, the file untouched.
     /// Nonzero: replaces the file with the document's text and then empties

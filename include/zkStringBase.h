@@ -35,12 +35,7 @@ public:
     enum CompareType : int { CaseInsensitive = 0, CaseSensitive = 1 };
 
     /// Bits for stripWhite; they may be combined with |.
-    enum StripType : unsigned {
-        StripLeading = 0x001,
-        StripTrailing = 0x010,
-        StripEnds = 0x011,
-        StripAll = 0x100
-    };
+    enum StripType : unsigned { StripLeading = 0x001, StripTrailing = 0x010, StripEnds = 0x011, StripAll = 0x100 };
 
     /// No position: the result of every search that finds nothing. As the end
     /// of a range it means the last character; as the start of a backward
@@ -233,8 +228,7 @@ public:
     /// non-zero, empties out. out is never emptied at the start.
     unsigned subString(char sep, zkStringBase& out, unsigned from, unsigned to, int clearOnFail) const;
     /// The same, where any byte of seps is a separator (exact comparison).
-    unsigned subString(const zkStringBase& seps, zkStringBase& out, unsigned from, unsigned to,
-                       int clearOnFail) const;
+    unsigned subString(const zkStringBase& seps, zkStringBase& out, unsigned from, unsigned to, int clearOnFail) const;
 
     /// ---- Conversion, case and whitespace ----
 

@@ -3,10 +3,11 @@
 #include <initializer_list>
 #include <utility>
 
-#include "../internal/zkCaseTables.h"
-#include "../internal/zkCharRules.h"
+#include "internal/zkCaseTables.h"
+#include "internal/zkCharRules.h"
+#include "internal/zkOutOfMemory.h"
+#include "internal/zkStringRules.h"
 #include "zkINIEditorImpl.h"
-#include "zkMappedINIFileDetail.h"
 
 namespace {
 
@@ -174,8 +175,8 @@ void zkINIEditor::Impl::appendSection(const zkStringBase& name, const zkStringBa
     sections.emplace_back();
     Lines& lines = sections.back().lines;
     lines.push_back(makeLine({{"[", 1}, {name.data(), name.length()}, {"]", 1}}, lineEnd, lineEndLength));
-    lines.push_back(makeLine({{key.data(), key.length()}, {"=", 1}, {value.data(), value.length()}}, lineEnd,
-                             lineEndLength));
+    lines.push_back(
+        makeLine({{key.data(), key.length()}, {"=", 1}, {value.data(), value.length()}}, lineEnd, lineEndLength));
 }
 
 // The value's bytes are replaced and everything around them kept. An empty
@@ -187,7 +188,9 @@ void zkINIEditor::Impl::replaceValue(Line& line, const zkStringBase& value) {
         while (from < line.length && zkIsSpace(line.text[from])) ++from;
     const unsigned to = from + line.valueLength;
     const char* equals = line.hasEquals ? "" : "=";
-    line = makeLine({{line.text, from}, {equals, line.hasEquals ? 0u : 1u}, {value.data(), value.length()},
+    line = makeLine({{line.text, from},
+                     {equals, line.hasEquals ? 0u : 1u},
+                     {value.data(), value.length()},
                      {line.text + to, line.length - to}},
                     line.text + line.length, line.endLength);
 }
@@ -248,7 +251,7 @@ void zkINIEditor::GetSectionNames(std::list<zkStringBase>& names) const {
 }
 
 int zkINIEditor::GetKeyValues(const zkStringBase& section,
-                              std::list<std::pair<zkStringBase, zkStringBase> >& pairs) const {
+                              std::list<std::pair<zkStringBase, zkStringBase>>& pairs) const {
     const int s = m_impl->findSection(section);
     if (s < 0) return Missing;
     for (const zkINIEditorLine& line : m_impl->sections[static_cast<size_t>(s)].lines)

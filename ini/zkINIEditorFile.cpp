@@ -9,8 +9,8 @@
 #include <chrono>
 #include <cstring>
 
-#include "../internal/zkFileSystem.h"
-#include "../internal/zkStringRules.h"
+#include "internal/zkFileSystem.h"
+#include "internal/zkStringRules.h"
 #include "zkINIEditorImpl.h"
 
 namespace {
@@ -25,22 +25,9 @@ constexpr long kLongestPauseNs = 16000000;
 using Clock = std::chrono::steady_clock;
 
 // Keeps errno across cleanup calls that may change it.
-class ErrnoKeeper {
-public:
-    ErrnoKeeper() : m_saved(errno) {}
-    ~ErrnoKeeper() { errno = m_saved; }
-
-private:
-    int m_saved;
-};
-
 void closeKeepingErrno(int fd) {
-    ErrnoKeeper keep;
+    zkErrnoKeeper keep;
     close(fd);
-}
-
-bool sameFile(const struct stat& a, const struct stat& b) {
-    return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
 }
 
 // Reads fd from where it stands to its end; false with errno on failure,
@@ -110,7 +97,7 @@ int lockFile(const std::string& path, bool create, unsigned waitMs) {
             return -1;
         }
         struct stat locked, named;
-        if (fstat(fd, &locked) == 0 && stat(path.c_str(), &named) == 0 && sameFile(locked, named)) return fd;
+        if (fstat(fd, &locked) == 0 && stat(path.c_str(), &named) == 0 && zkSameFile(locked, named)) return fd;
         close(fd);
     }
 }
@@ -181,7 +168,7 @@ int zkINIEditor::Save() {
             if (fstat(fd, &written) != 0 || fstat(impl.lockFd, &locked) != 0) return false;
             if (newLock != -1) closeKeepingErrno(newLock);
             newLock = -1;
-            if (!sameFile(written, locked)) {
+            if (!zkSameFile(written, locked)) {
                 newLock = fcntl(fd, F_DUPFD_CLOEXEC, 0);
                 if (newLock == -1) return false;
                 if (flock(newLock, LOCK_EX | LOCK_NB) != 0) return false;

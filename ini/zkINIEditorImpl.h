@@ -10,7 +10,7 @@
 #include <utility>
 #include <vector>
 
-#include "../internal/zkOutOfMemory.h"
+#include "internal/zkOutOfMemory.h"
 #include "zkINIEditor.h"
 #include "zkINILineRules.h"
 
@@ -22,9 +22,9 @@ struct zkINIEditorLine {
     unsigned char endLength;  // 0 (the text's last line only), 1 or 2
     zkINILine::Kind kind;
     bool hasEquals;
-    unsigned name;            // header name, key or comment text
+    unsigned name;  // header name, key or comment text
     unsigned nameLength;
-    unsigned value;           // a key's value
+    unsigned value;  // a key's value
     unsigned valueLength;
 };
 using zkINIEditorLines = std::vector<zkINIEditorLine, zkNodeAllocator<zkINIEditorLine>>;
@@ -82,8 +82,7 @@ struct __attribute__((visibility("hidden"))) zkINIEditor::Impl {
 private:
     Line record(const char* begin, const char* contentEnd, const char* next) const;
     // A new line of the pieces' bytes followed by end (endLength bytes).
-    Line makeLine(std::initializer_list<std::pair<const char*, unsigned>> pieces, const char* end,
-                  unsigned endLength);
+    Line makeLine(std::initializer_list<std::pair<const char*, unsigned>> pieces, const char* end, unsigned endLength);
     Line withLineEnd(const Line& line);
     void insertKey(Section& section, const zkStringBase& key, const zkStringBase& value);
     void appendSection(const zkStringBase& name, const zkStringBase& key, const zkStringBase& value);

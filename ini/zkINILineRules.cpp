@@ -3,7 +3,7 @@
 
 #include <cstring>
 
-#include "../internal/zkCharRules.h"
+#include "internal/zkCharRules.h"
 
 namespace {
 

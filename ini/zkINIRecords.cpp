@@ -1,6 +1,7 @@
 // The document's records: lines, sections, and the key comparator.
+#include "internal/zkOutOfMemory.h"
+#include "internal/zkStringRules.h"
 #include "zkMappedINIFile.h"
-#include "zkMappedINIFileDetail.h"
 
 namespace {
 
@@ -20,7 +21,7 @@ INILine::INILine() : m_key(kEmptyCapacity), m_value(kEmptyCapacity), m_isComment
 INISection::INISection() : m_name(kEmptyCapacity), m_lines(zkNewRecord<std::list<INILine*>>()) {}
 
 INISection::INISection(const zkStringBase& name) : INISection() {
-    zkAssignSized(m_name, name);
+    zkAssignExact(m_name, name);
 }
 
 INISection::~INISection() {

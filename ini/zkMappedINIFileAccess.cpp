@@ -1,17 +1,20 @@
 // Reading and changing values, and merging documents.
+#include "zkMappedINIFile.h"
+
 #include <algorithm>
+#include <cassert>
 #include <cstddef>
 
-#include "zkMappedINIFile.h"
-#include "zkMappedINIFileDetail.h"
+#include "internal/zkOutOfMemory.h"
+#include "internal/zkStringRules.h"
 
 namespace {
 
 // A new line holding sized copies of key and value.
 INILine* newLine(const zkStringBase& key, const zkStringBase& value, int isComment) {
     INILine* line = zkNewRecord<INILine>();
-    zkAssignSized(line->m_key, key);
-    zkAssignSized(line->m_value, value);
+    zkAssignExact(line->m_key, key);
+    zkAssignExact(line->m_value, value);
     line->m_isComment = isComment;
     return line;
 }
@@ -27,12 +30,14 @@ void zkMappedINIFile::GetSectionNameList(std::list<zkStringBase>& names) {
 }
 
 std::list<INILine*>* zkMappedINIFile::GetPropertyList(const char* name) {
+    assert(name != nullptr);
     for (INISection* section : m_sections)
         if (section->m_name.equals(name, false)) return section->m_lines;
     return nullptr;
 }
 
 std::list<INILine*>::iterator zkMappedINIFile::FindKey(std::list<INILine*>* lines, const zkStringBase& key) {
+    assert(lines != nullptr);
     return std::find_if(lines->begin(), lines->end(), INILine::KeyCompare(key));
 }
 
@@ -62,7 +67,7 @@ void zkMappedINIFile::SetVal(const zkStringBase& section, const zkStringBase& ke
         matched = true;
         auto found = FindKey(each->m_lines, key);
         if (found != each->m_lines->end())
-            zkAssignSized((*found)->m_value, value);
+            zkAssignExact((*found)->m_value, value);
         else
             zkAppendNode(*each->m_lines, newLine(key, value, 0));
     }
@@ -109,7 +114,7 @@ void zkMappedINIFile::DoUpdateMapSection(std::list<INILine*>* target, std::list<
             return line->m_isComment != 1 && line->m_key.equals(from->m_key, false);
         });
         if (found != target->end())
-            zkAssignSized((*found)->m_value, from->m_value);
+            zkAssignExact((*found)->m_value, from->m_value);
         else
             zkAppendNode(*target, newLine(from->m_key, from->m_value, from->m_isComment));
     }

@@ -1,14 +1,16 @@
 // The document's lifetime, and loading a file.
+#include "zkMappedINIFile.h"
+
 #include <fcntl.h>
 
 #include <cerrno>
 #include <cstring>
 #include <memory>
 
+#include "internal/zkOutOfMemory.h"
+#include "internal/zkStringRules.h"
 #include "zkBasicFile.h"
-#include "zkMappedINIFile.h"
 #include "zkINILineRules.h"
-#include "zkMappedINIFileDetail.h"
 
 namespace {
 

@@ -1,9 +1,10 @@
 // Writing the document back to its file.
+#include "zkMappedINIFile.h"
+
 #include <cerrno>
 
-#include "../internal/zkFileSystem.h"
-#include "../internal/zkStringRules.h"
-#include "zkMappedINIFile.h"
+#include "internal/zkFileSystem.h"
+#include "internal/zkStringRules.h"
 
 namespace {
 
@@ -12,7 +13,6 @@ constexpr char kFirewallSection[] = "IPsBehindFirewall";
 
 // The blank that may follow a line of one character.
 constexpr unsigned long long kLinePad = 1;
-
 
 // The mode of a file that a save creates, less the umask.
 constexpr mode_t kNewFileMode = 0666;

@@ -14,15 +14,23 @@ class zkCaseTables {
 public:
 #if defined(__GLIBC__)
     zkCaseTables() : m_upper(*__ctype_toupper_loc()), m_lower(*__ctype_tolower_loc()) {}
-    int upper(char c) const { return m_upper[static_cast<signed char>(c)]; }
-    int lower(char c) const { return m_lower[static_cast<signed char>(c)]; }
+    int upper(char c) const {
+        return m_upper[static_cast<signed char>(c)];
+    }
+    int lower(char c) const {
+        return m_lower[static_cast<signed char>(c)];
+    }
 
 private:
     const std::int32_t* m_upper;
     const std::int32_t* m_lower;
 #else
-    int upper(char c) const { return std::toupper(static_cast<signed char>(c)); }
-    int lower(char c) const { return std::tolower(static_cast<signed char>(c)); }
+    int upper(char c) const {
+        return std::toupper(static_cast<signed char>(c));
+    }
+    int lower(char c) const {
+        return std::tolower(static_cast<signed char>(c));
+    }
 #endif
 };
 

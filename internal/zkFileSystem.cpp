@@ -29,16 +29,6 @@ constexpr mode_t kPrivateMode = 0600;
 // takes over.
 constexpr mode_t kPermissionBits = 07777;
 
-// Keeps errno across cleanup calls that may change it.
-class ErrnoKeeper {
-public:
-    ErrnoKeeper() : m_saved(errno) {}
-    ~ErrnoKeeper() { errno = m_saved; }
-
-private:
-    int m_saved;
-};
-
 std::string directoryOf(const std::string& path) {
     size_t slash = path.rfind('/');
     return slash == std::string::npos ? std::string() : path.substr(0, slash + 1);
@@ -55,10 +45,9 @@ std::string tempName(const std::string& target) {
     static std::atomic<unsigned> counter{0};
     struct timespec now = {};
     clock_gettime(CLOCK_REALTIME, &now);
-    unsigned long long mix = static_cast<unsigned long long>(now.tv_nsec) ^
-                             (static_cast<unsigned long long>(now.tv_sec) << 30) ^
-                             (static_cast<unsigned long long>(getpid()) << 40) ^
-                             (counter.fetch_add(1) * 0x9E3779B97F4A7C15ull);
+    unsigned long long mix =
+        static_cast<unsigned long long>(now.tv_nsec) ^ (static_cast<unsigned long long>(now.tv_sec) << 30) ^
+        (static_cast<unsigned long long>(getpid()) << 40) ^ (counter.fetch_add(1) * 0x9E3779B97F4A7C15ull);
     char suffix[24];
     std::snprintf(suffix, sizeof suffix, ".%012llx", mix & 0xFFFFFFFFFFFFull);
     return directoryOf(target) + "." + baseOf(target).substr(0, kTempNameKeep) + suffix;
@@ -70,7 +59,7 @@ int closeChecked(int fd) {
 }
 
 int fail(int fd) {
-    ErrnoKeeper keep;
+    zkErrnoKeeper keep;
     if (fd != -1) close(fd);
     return 1;
 }
@@ -115,15 +104,14 @@ enum class Outcome { Done, Failed, NotHere };
 // new file or refuses the rename. An existing file's replacement is private
 // until it holds the old file's mode; a new file's mode is the caller's
 // (less the umask), as there is no old content to guard.
-Outcome replaceBeside(const std::string& target, const struct stat* old, mode_t newMode,
-                      const zkContentWriter& write) {
+Outcome replaceBeside(const std::string& target, const struct stat* old, mode_t newMode, const zkContentWriter& write) {
     std::string temp;
     int fd = createBeside(target, old ? kPrivateMode : newMode, temp);
     if (fd == -1) return refusedHere(errno) ? Outcome::NotHere : Outcome::Failed;
     int failed = old && takeOverMode(fd, *old) != 0 ? fail(fd) : writeAndClose(fd, write, true);
     if (!failed && rename(temp.c_str(), target.c_str()) != 0) failed = refusedHere(errno) ? 2 : 1;
     if (failed) {
-        ErrnoKeeper keep;
+        zkErrnoKeeper keep;
         unlink(temp.c_str());
         return failed == 2 ? Outcome::NotHere : Outcome::Failed;
     }
@@ -149,7 +137,7 @@ bool readAll(int fd, std::vector<char>& bytes, size_t size) {
 // Puts the old bytes and length back after a failed rewrite. They fitted
 // before, so no new room is needed for them.
 void restore(int fd, const std::vector<char>& old) {
-    ErrnoKeeper keep;
+    zkErrnoKeeper keep;
     size_t put = 0;
     while (put < old.size()) {
         ssize_t n = pwrite(fd, old.data() + put, old.size() - put, static_cast<off_t>(put));
@@ -276,7 +264,7 @@ int zkCreateNewFile(const char* path, mode_t mode, bool sync, const zkContentWri
     int fd = zkOpen(path, O_CREAT | O_EXCL | O_WRONLY, mode);
     if (fd == -1) return 1;
     if (writeAndClose(fd, write, sync) == 0) return 0;
-    ErrnoKeeper keep;
+    zkErrnoKeeper keep;
     unlink(path);
     return 1;
 }

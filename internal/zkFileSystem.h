@@ -11,10 +11,30 @@
 #ifndef ZK_FILE_SYSTEM_H
 #define ZK_FILE_SYSTEM_H
 
+#include <errno.h>
+#include <sys/stat.h>
 #include <sys/types.h>
 
 #include <functional>
 #include <string>
+
+// Keeps errno across cleanup calls that may change it, so a failure's errno
+// reaches the caller.
+class zkErrnoKeeper {
+public:
+    zkErrnoKeeper() : m_saved(errno) {}
+    ~zkErrnoKeeper() { errno = m_saved; }
+    zkErrnoKeeper(const zkErrnoKeeper&) = delete;
+    zkErrnoKeeper& operator=(const zkErrnoKeeper&) = delete;
+
+private:
+    int m_saved;
+};
+
+// Whether two stat results describe the same file.
+inline bool zkSameFile(const struct stat& a, const struct stat& b) {
+    return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
 
 // Writes the new contents to the descriptor; false on failure, errno set.
 using zkContentWriter = std::function<bool(int fd)>;

@@ -30,4 +30,12 @@ inline void zkAssignExact(zkStringBase& s, const char* p, unsigned n) {
     s.assign(p, n);
 }
 
+// zkAssignExact with source's text and compare type, as an assignment would
+// take.
+inline void zkAssignExact(zkStringBase& s, const zkStringBase& source) {
+    if (&s == &source) return;
+    zkAssignExact(s, source.data(), source.length());
+    s.setCompareType(source.getCompareType());
+}
+
 #endif

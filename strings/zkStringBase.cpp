@@ -7,7 +7,7 @@
 #include <new>
 #include <string>
 
-#include "../internal/zkStringRules.h"
+#include "internal/zkStringRules.h"
 
 unsigned zkStringBase::_sGrowLength = 128;
 const zkStringBase zkStringBase::NullStr;

@@ -3,9 +3,9 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "../internal/zkCaseTables.h"
-#include "../internal/zkCharRules.h"
-#include "../internal/zkStringRules.h"
+#include "internal/zkCaseTables.h"
+#include "internal/zkCharRules.h"
+#include "internal/zkStringRules.h"
 
 namespace {
 

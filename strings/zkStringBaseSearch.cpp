@@ -2,7 +2,7 @@
 
 #include <cstring>
 
-#include "../internal/zkCaseTables.h"
+#include "internal/zkCaseTables.h"
 #include "zkFilename.h"
 
 namespace {
@@ -85,8 +85,7 @@ int zkStringBase::imemcmp(const char* a, const char* b, unsigned n) {
 
 short zkStringBase::compareTo(const zkStringBase& other, bool caseSensitive) const {
     unsigned common = m_length < other.m_length ? m_length : other.m_length;
-    int d = caseSensitive ? signOfExactDifference(m_data, other.m_data, common)
-                          : imemcmp(m_data, other.m_data, common);
+    int d = caseSensitive ? signOfExactDifference(m_data, other.m_data, common) : imemcmp(m_data, other.m_data, common);
     if (d) return static_cast<short>(d);
     return orderByLength(m_length, other.m_length);
 }

@@ -1,3 +1,5 @@
 #include "zkutilVersion.h"
 
-const char* zkutilVersion() { return ZKUTIL_VERSION; }
+const char* zkutilVersion() {
+    return ZKUTIL_VERSION;
+}

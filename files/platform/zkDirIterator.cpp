@@ -1,5 +1,3 @@
-#include "zkFilename.h"
-
 #include <dirent.h>
 #include <fnmatch.h>
 
@@ -8,7 +6,8 @@
 #include <string>
 #include <vector>
 
-#include "../../internal/zkPathRules.h"
+#include "internal/zkPathRules.h"
+#include "zkFilename.h"
 
 namespace {
 

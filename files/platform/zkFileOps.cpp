@@ -1,5 +1,3 @@
-#include "zkFilename.h"
-
 #include <errno.h>
 #include <fcntl.h>
 #include <stdio.h>
@@ -8,9 +6,9 @@
 
 #include <string>
 
-#include "../../internal/zkFileSystem.h"
-
-#include "../../internal/zkPathRules.h"
+#include "internal/zkFileSystem.h"
+#include "internal/zkPathRules.h"
+#include "zkFilename.h"
 
 namespace {
 

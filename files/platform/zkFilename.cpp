@@ -6,7 +6,7 @@
 #include <cstring>
 #include <initializer_list>
 
-#include "../../internal/zkPathRules.h"
+#include "internal/zkPathRules.h"
 
 namespace {
 
@@ -27,7 +27,7 @@ char* copyOf(const char* s, size_t n) {
 // Replaces an empty part by null, so that every empty part looks the same.
 void dropIfEmpty(char** part) {
     if (*part && **part == '\0') {
-        delete[] *part;
+        delete[] * part;
         *part = nullptr;
     }
 }
@@ -45,7 +45,7 @@ void moveDirectoryPart(char** dir, char* name) {
     if (joint) joined[dirLength] = kZkPathSeparator;
     std::memcpy(joined + dirLength + joint, name, moved);
     joined[dirLength + joint + moved] = '\0';
-    delete[] *dir;
+    delete[] * dir;
     *dir = joined;
     std::memmove(name, slash + 1, std::strlen(slash + 1) + 1);
 }
@@ -69,7 +69,7 @@ void endWithSeparator(char** dir) {
     if (n == 0 || (*dir)[n - 1] == kZkPathSeparator) return;
     char* ended = copyOf(*dir, n + 1);
     ended[n] = kZkPathSeparator;
-    delete[] *dir;
+    delete[] * dir;
     *dir = ended;
 }
 
@@ -124,7 +124,7 @@ zkFilename::~zkFilename() {
 
 void zkFilename::release() {
     for (char** part : {&m_path, &m_dir, &m_fname, &m_ext, &m_protocol}) {
-        delete[] *part;
+        delete[] * part;
         *part = nullptr;
     }
 }
@@ -140,7 +140,7 @@ char* zkFilename::Dup(char** target, const char* source, int length) {
         size_t n = length < 0 ? std::strlen(source) : strnlen(source, static_cast<size_t>(length));
         copy = copyOf(source, n);
     }
-    delete[] *target;
+    delete[] * target;
     *target = copy;
     return copy;
 }

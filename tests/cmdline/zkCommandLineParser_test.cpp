@@ -1,10 +1,10 @@
 // Parsing command strings and argument vectors with zkCommandLineParser.
-#include "zkCommandLineParser.h"
-
 #include <gtest/gtest.h>
 
 #include <initializer_list>
 #include <string>
+
+#include "zkCommandLineParser.h"
 
 namespace {
 
@@ -17,7 +17,9 @@ std::string entries(const zkCommandLineParser& p, Names names) {
     return out.substr(1);
 }
 
-char* arg(const char* s) { return const_cast<char*>(s); }
+char* arg(const char* s) {
+    return const_cast<char*>(s);
+}
 
 struct Refusing : zkCommandLineParser {
     using zkCommandLineParser::zkCommandLineParser;
@@ -27,7 +29,12 @@ struct Refusing : zkCommandLineParser {
 }  // namespace
 
 TEST(CommandLineString, OnlySpacesSeparateAndASwitchBeforeASwitchStoresNothing) {
-    const struct { const char* command; char switchChar, separator; Names names; const char* values; } cases[] = {
+    const struct {
+        const char* command;
+        char switchChar, separator;
+        Names names;
+        const char* values;
+    } cases[] = {
         {"prog -in:data.ini -out:\"my file.ini\"", '-', ':', {"in", "out", "prog"}, "data.ini|my file.ini|<none>"},
         {"-n: 5 -n:6 -a:1-b:2", '-', ':', {"n", "a", "b"}, "6|1-b:2|<none>"},
         {"-v -x:1 -a:\"\" -b:\"x y", '-', ':', {"v -x", "x", "a", "b"}, "1|<none>||x y"},
@@ -45,8 +52,9 @@ TEST(CommandLineString, OnlySpacesSeparateAndASwitchBeforeASwitchStoresNothing) 
 }
 
 TEST(CommandLineVector, EachElementIsOneSwitchAndValidateGivesTheResult) {
-    char* argv[] = {arg("-ignored:1"), arg("-in:data.ini"), arg("-out:a:b"), arg("-o:"), arg("-level"),
-                    arg("-:x"),        arg("-"),            arg("file.ini"), arg("-in:other"), arg("/path=out")};
+    char* argv[] = {arg("-ignored:1"), arg("-in:data.ini"), arg("-out:a:b"), arg("-o:"),
+                    arg("-level"),     arg("-:x"),          arg("-"),        arg("file.ini"),
+                    arg("-in:other"),  arg("/path=out")};
     zkCommandLineParser p(10, argv);
     EXPECT_EQ(1, p.ParseCommand());
     EXPECT_EQ("other|a:b|||x|<none>|<none>", entries(p, {"in", "out", "o", "l", "", "ignored", "file.ini"}));

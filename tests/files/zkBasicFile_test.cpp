@@ -1,6 +1,4 @@
 // zkBasicFile: results, ReadAll, 64-bit positions, long names.
-#include "zkBasicFile.h"
-
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <unistd.h>
@@ -8,9 +6,12 @@
 #include <cerrno>
 
 #include "support/zkTempDir.h"
+#include "zkBasicFile.h"
 #include "zkStringBase.h"
 
-static std::string bytes(const zkStringBase& s) { return std::string(s.data(), s.length()); }
+static std::string bytes(const zkStringBase& s) {
+    return std::string(s.data(), s.length());
+}
 
 TEST(BasicFile, OpenWriteReadAllAndTheirFailures) {
     zkTempDir dir;

@@ -1,12 +1,11 @@
 // zkFileInfo records and zkFileManager::GetFileInfo.
-#include "zkFileInfo.h"
-
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include "support/zkTempDir.h"
+#include "zkFileInfo.h"
 #include "zkFileManager.h"
 
 TEST(FileInfo, GetFileInfoFillsTheRecordOrLeavesItAlone) {

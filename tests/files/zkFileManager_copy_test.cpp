@@ -19,7 +19,9 @@ static int copyFile(const std::string& from, const std::string& to, unsigned rec
     return zkFileManager::CopyFile(source, target, recursive, makeDir, overwrite, 0, deleteSource, nullptr, nullptr);
 }
 
-static bool exists(const std::string& path) { return zkFilename(path.c_str()).FileExists(1) != 0; }
+static bool exists(const std::string& path) {
+    return zkFilename(path.c_str()).FileExists(1) != 0;
+}
 
 // The entries below dir in byte order: "name=content", "name/" followed by
 // the directory's entries, or "name->target".
@@ -29,9 +31,12 @@ static std::string tree(const std::string& dir, const std::string& prefix = "") 
         const std::string name = it.GetName(), path = dir + "/" + name;
         char target[512] = {};
         if (name == "." || name == "..") continue;
-        if (readlink(path.c_str(), target, sizeof target - 1) >= 0) out += prefix + name + "->" + target + " ";
-        else if (zkFilename::IsDirectory(path.c_str())) out += prefix + name + "/ " + tree(path, prefix + name + "/");
-        else out += prefix + name + "=" + zkReadFile(path) + " ";
+        if (readlink(path.c_str(), target, sizeof target - 1) >= 0)
+            out += prefix + name + "->" + target + " ";
+        else if (zkFilename::IsDirectory(path.c_str()))
+            out += prefix + name + "/ " + tree(path, prefix + name + "/");
+        else
+            out += prefix + name + "=" + zkReadFile(path) + " ";
     }
     return out;
 }
@@ -145,8 +150,12 @@ TEST(FileManagerCopy, DirectoryCopiesTheirResultsAndLoops) {
     ASSERT_EQ(0, symlink("..", (src + "/up").c_str()));
     ASSERT_EQ(0, symlink(src.c_str(), (src + "/sub/self").c_str()));
     EXPECT_EQ(0, copyFile(src, src + "/in/deep", 1));
-    EXPECT_EQ(".h=H a.txt=A b.log=B in/ in/deep/ in/deep/.h=H in/deep/a.txt=A in/deep/b.log=B in/deep/in/ "
-              "in/deep/sub/ in/deep/sub/c.txt=C in/deep/sub/self->" + src + " in/deep/up->.. sub/ sub/c.txt=C "
-              "sub/self->" + src + " up->.. ",
-              tree(src));
+    EXPECT_EQ(
+        ".h=H a.txt=A b.log=B in/ in/deep/ in/deep/.h=H in/deep/a.txt=A in/deep/b.log=B in/deep/in/ "
+        "in/deep/sub/ in/deep/sub/c.txt=C in/deep/sub/self->" +
+            src +
+            " in/deep/up->.. sub/ sub/c.txt=C "
+            "sub/self->" +
+            src + " up->.. ",
+        tree(src));
 }

@@ -45,8 +45,10 @@ void removeBelow(const std::string& path) {
             std::string next;
             for (const std::string& name : zkDirEntries(".")) {
                 struct stat st;
-                if (lstat(name.c_str(), &st) == 0 && S_ISDIR(st.st_mode) && rmdir(name.c_str()) != 0) next = name;
-                else if (!S_ISDIR(st.st_mode)) unlink(name.c_str());
+                if (lstat(name.c_str(), &st) == 0 && S_ISDIR(st.st_mode) && rmdir(name.c_str()) != 0)
+                    next = name;
+                else if (!S_ISDIR(st.st_mode))
+                    unlink(name.c_str());
             }
             if (!next.empty() && chdir(next.c_str()) == 0) {
                 ++depth;

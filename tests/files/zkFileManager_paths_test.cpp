@@ -12,16 +12,34 @@ static std::string joined(const char* dir, const char* name, unsigned noTrailing
 }
 
 TEST(MakePath, JoinsDirectoryAndName) {
-    const struct { const char *dir, *name; unsigned flag; const char* path; } cases[] = {
-        {"", "x", 0, "/x/"}, {"/tmp/", "/x", 1, "/tmp/x"}, {"/a/", "b/", 1, "/a/b"}, {"/a", ".", 0, "/a/"},
-        {"D:\\data", "./a", 1, "D:/data/a"}, {"/home/u", ".profile", 1, "/home/u/.profile"},
+    const struct {
+        const char *dir, *name;
+        unsigned flag;
+        const char* path;
+    } cases[] = {
+        {"", "x", 0, "/x/"},
+        {"/tmp/", "/x", 1, "/tmp/x"},
+        {"/a/", "b/", 1, "/a/b"},
+        {"/a", ".", 0, "/a/"},
+        {"D:\\data", "./a", 1, "D:/data/a"},
+        {"/home/u", ".profile", 1, "/home/u/.profile"},
         // Walks to the parent, for leading steps only.
-        {"/a/b", "..", 0, "/a/"}, {"/a/b", "../", 1, "/a"}, {"/a/b/d", "../../x", 0, "/a/x/"},
-        {"a/b", "../x", 1, "a/x"}, {"/a/b", "../.hidden", 1, "/a/.hidden"}, {"/a/b", "..x", 1, "/a/b/..x"},
-        {"/a/b", ".././x", 1, "/a/x"}, {"/a/b", "../x/../y", 1, "/a/x/../y"}, {"C:\\x\\y", "..\\z", 1, "C:/x/z"},
+        {"/a/b", "..", 0, "/a/"},
+        {"/a/b", "../", 1, "/a"},
+        {"/a/b/d", "../../x", 0, "/a/x/"},
+        {"a/b", "../x", 1, "a/x"},
+        {"/a/b", "../.hidden", 1, "/a/.hidden"},
+        {"/a/b", "..x", 1, "/a/b/..x"},
+        {"/a/b", ".././x", 1, "/a/x"},
+        {"/a/b", "../x/../y", 1, "/a/x/../y"},
+        {"C:\\x\\y", "..\\z", 1, "C:/x/z"},
         // Climbing stops at the root, which stays "/".
-        {"ab", "../x", 1, "/x"}, {"/ab", "../../x", 1, "/x"}, {"/ab", "..", 1, "/"}, {"/ab", "..", 0, "/"},
-        {"", "", 1, "/"}, {"", "../..", 1, "/"},
+        {"ab", "../x", 1, "/x"},
+        {"/ab", "../../x", 1, "/x"},
+        {"/ab", "..", 1, "/"},
+        {"/ab", "..", 0, "/"},
+        {"", "", 1, "/"},
+        {"", "../..", 1, "/"},
     };
     for (const auto& c : cases) EXPECT_EQ(c.path, joined(c.dir, c.name, c.flag)) << c.dir << " + " << c.name;
 

@@ -1,11 +1,10 @@
 // The platform file layer: zkFilename and the handle functions.
-#include "zkFilename.h"
-
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <unistd.h>
 
 #include "support/zkTempDir.h"
+#include "zkFilename.h"
 
 static std::string parts(const zkFilename& f) {
     return std::string(f.GetDirectory()) + "|" + f.GetName() + "|" + f.GetExtension();
@@ -13,8 +12,14 @@ static std::string parts(const zkFilename& f) {
 
 TEST(Filename, SplitsIntoDirectoryNameAndExtension) {
     const char* cases[][2] = {
-        {"/opt/app/bin", "/opt/app/|bin|"}, {"/d/a.tar.gz", "/d/|a.tar|gz"}, {"/u/.profile", "/u/|.profile|"},
-        {"..", "|..|"}, {"a.", "|a.|"}, {"x/a..b", "x/|a.|b"}, {"/e/", "/e/||"}, {"", "||"},
+        {"/opt/app/bin", "/opt/app/|bin|"},
+        {"/d/a.tar.gz", "/d/|a.tar|gz"},
+        {"/u/.profile", "/u/|.profile|"},
+        {"..", "|..|"},
+        {"a.", "|a.|"},
+        {"x/a..b", "x/|a.|b"},
+        {"/e/", "/e/||"},
+        {"", "||"},
     };
     for (const auto& c : cases) EXPECT_EQ(c[1], parts(zkFilename(c[0]))) << c[0];
     EXPECT_STREQ("http", zkFilename("HTTP://h/").GetProtocol());

@@ -115,9 +115,15 @@ TEST(IniEditor, ReadsAsTheDocumentAndSavesEveryByte) {
     const struct {
         const char* file;
         const char* preamble;
-    } rows[] = {{"sectionless.ini", ""},    {"preamble.ini", ""},      {"crlf.ini", ""},
-                {"bom.ini", nullptr},       {"header_comment.ini", nullptr}, {"continuation.ini", nullptr},
-                {"repeated.ini", nullptr},  {"inline_comment.ini", nullptr}, {"no_final_line_end.ini", nullptr},
+    } rows[] = {{"sectionless.ini", ""},
+                {"preamble.ini", ""},
+                {"crlf.ini", ""},
+                {"bom.ini", nullptr},
+                {"header_comment.ini", nullptr},
+                {"continuation.ini", nullptr},
+                {"repeated.ini", nullptr},
+                {"inline_comment.ini", nullptr},
+                {"no_final_line_end.ini", nullptr},
                 {"firewall.ini", nullptr}};
     zkTempDir dir;
     for (const auto& row : rows) {
@@ -156,13 +162,20 @@ TEST(IniEditor, RefusesTextThatWouldNotReadBack) {
         const char* value;
         int result;
     } rows[] = {
-        {"a]b", "k", "v", zkINIEditor::Refused},  {"a\nb", "k", "v", zkINIEditor::Refused},
-        {" a", "k", "v", zkINIEditor::Refused},   {"a", "", "v", zkINIEditor::Refused},
-        {"a", "k=x", "v", zkINIEditor::Refused},  {"a", "k\rx", "v", zkINIEditor::Refused},
-        {"a", "[k", "v", zkINIEditor::Refused},   {"a", ";k", "v", zkINIEditor::Refused},
-        {"a", "#k", "v", zkINIEditor::Refused},   {"a", "k\t", "v", zkINIEditor::Refused},
-        {"a", "\vk", "v", zkINIEditor::Refused},  {"a", "k", "v\n", zkINIEditor::Refused},
-        {"a", "k", " v", zkINIEditor::Refused},   {"a", "k", "v ", zkINIEditor::Refused},
+        {"a]b", "k", "v", zkINIEditor::Refused},
+        {"a\nb", "k", "v", zkINIEditor::Refused},
+        {" a", "k", "v", zkINIEditor::Refused},
+        {"a", "", "v", zkINIEditor::Refused},
+        {"a", "k=x", "v", zkINIEditor::Refused},
+        {"a", "k\rx", "v", zkINIEditor::Refused},
+        {"a", "[k", "v", zkINIEditor::Refused},
+        {"a", ";k", "v", zkINIEditor::Refused},
+        {"a", "#k", "v", zkINIEditor::Refused},
+        {"a", "k\t", "v", zkINIEditor::Refused},
+        {"a", "\vk", "v", zkINIEditor::Refused},
+        {"a", "k", "v\n", zkINIEditor::Refused},
+        {"a", "k", " v", zkINIEditor::Refused},
+        {"a", "k", "v ", zkINIEditor::Refused},
         {"a[", "k]", "=v ; not a comment", zkINIEditor::Missing},
         {"a", "k k", "", zkINIEditor::Missing},
         {"a", "k", "x", zkINIEditor::Missing},
@@ -218,12 +231,9 @@ TEST(IniEditor, NewLinesTakeTheFilesLineEnds) {
         const char* section;
         const char* expected;
     } rows[] = {
-        {"", "s", "[s]\nk=v\n"},
-        {"\xEF\xBB\xBF", "s", "\xEF\xBB\xBF[s]\nk=v\n"},
-        {"", "", "k=v\n"},
-        {"\r\n[a]\r\n", "", "k=v\r\n\r\n[a]\r\n"},
-        {"x=1\r", "", "x=1\rk=v\r"},
-        {"[a]\r\n\r\n", "b", "[a]\r\n\r\n[b]\r\nk=v\r\n"},
+        {"", "s", "[s]\nk=v\n"},     {"\xEF\xBB\xBF", "s", "\xEF\xBB\xBF[s]\nk=v\n"},
+        {"", "", "k=v\n"},           {"\r\n[a]\r\n", "", "k=v\r\n\r\n[a]\r\n"},
+        {"x=1\r", "", "x=1\rk=v\r"}, {"[a]\r\n\r\n", "b", "[a]\r\n\r\n[b]\r\nk=v\r\n"},
         {"[a]", "a", "[a]\nk=v"},
     };
     for (const auto& row : rows) {

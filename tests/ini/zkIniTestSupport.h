@@ -7,11 +7,17 @@
 #include "support/zkTempDir.h"
 #include "zkMappedINIFile.h"
 
-inline std::string zkText(const zkStringBase& s) { return std::string(s.data(), s.length()); }
+inline std::string zkText(const zkStringBase& s) {
+    return std::string(s.data(), s.length());
+}
 
-inline zkStringBase zkStr(const char* text) { return zkStringBase(text); }
+inline zkStringBase zkStr(const char* text) {
+    return zkStringBase(text);
+}
 
-inline std::string zkTestData(const std::string& name) { return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name); }
+inline std::string zkTestData(const std::string& name) {
+    return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name);
+}
 
 // "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
 inline std::string zkDump(zkMappedINIFile& ini) {

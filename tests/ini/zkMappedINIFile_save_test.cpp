@@ -90,9 +90,17 @@ TEST(IniSave, KeepsPermissionsOwnerAndLinks) {
 TEST(IniSave, FailedSavesKeepTheFileAndTheDocument) {
     zkTempDir dir;
     const std::string path = dir.file("a.ini"), old = "[s]\nk=old\n\n";
-    const struct { std::string file; const char *section, *key; std::string value; } cases[] = {
-        {dir.file("missing/a.ini"), "s", "k", "v"}, {"", "s", "k", "v"},     {path, "s", "k", std::string(4000, 'v')},
-        {path, "s", "k", "a\nb"},                   {path, "s", "k\r", "v"}, {path, "x\ny", "k", "v"},
+    const struct {
+        std::string file;
+        const char *section, *key;
+        std::string value;
+    } cases[] = {
+        {dir.file("missing/a.ini"), "s", "k", "v"},
+        {"", "s", "k", "v"},
+        {path, "s", "k", std::string(4000, 'v')},
+        {path, "s", "k", "a\nb"},
+        {path, "s", "k\r", "v"},
+        {path, "x\ny", "k", "v"},
     };
     for (const auto& c : cases) {
         zkMappedINIFile ini;
@@ -101,7 +109,10 @@ TEST(IniSave, FailedSavesKeepTheFileAndTheDocument) {
         const std::string kept = zkDump(ini);
         ini.SetFilename(c.file.c_str());
         int closed = 0, closedFW = 0;
-        ASSERT_TRUE(zkWithFileSizeLimit(1024, [&] { closed = ini.Close(1); closedFW = ini.CloseFW(1); }));
+        ASSERT_TRUE(zkWithFileSizeLimit(1024, [&] {
+            closed = ini.Close(1);
+            closedFW = ini.CloseFW(1);
+        }));
         EXPECT_TRUE(closed == 1 && closedFW == 1) << c.file << c.section << c.key << c.value.size();
         EXPECT_EQ(kept, zkDump(ini));
         EXPECT_EQ(old, zkReadFile(path));

@@ -54,8 +54,10 @@ int replaceInChild(const Caller& caller, const zkTempDir& dir, const std::string
     if (pid == 0) {
         if (otherUser && (setgid(kOtherUser) != 0 || setuid(kOtherUser) != 0)) _exit(100);
         int result = 100;
-        if (limit == 0) result = caller.replace(dir, target);
-        else if (!zkWithFileSizeLimit(limit, [&] { result = caller.replace(dir, target); })) _exit(100);
+        if (limit == 0)
+            result = caller.replace(dir, target);
+        else if (!zkWithFileSizeLimit(limit, [&] { result = caller.replace(dir, target); }))
+            _exit(100);
         _exit(result);
     }
     int status = 0;
@@ -73,7 +75,9 @@ struct Target {
     bool lockedDirectory;
 };
 
-bool root() { return geteuid() == 0; }
+bool root() {
+    return geteuid() == 0;
+}
 
 // A temporary directory holding the copy's source, opened up again before
 // it removes itself.
@@ -117,7 +121,8 @@ TEST(SafeReplace, FailureKeepsTheOldFileAndSuccessTheOldMode) {
                 const std::set<std::string> before = zkDirEntries(box.dir.path());
                 const mode_t mode = statOf(box.real(t)).st_mode;
 
-                const int result = replaceInChild(caller, box.dir, path, t.lockedDirectory && root(), failing ? 1000 : 0);
+                const int result =
+                    replaceInChild(caller, box.dir, path, t.lockedDirectory && root(), failing ? 1000 : 0);
                 EXPECT_EQ(failing ? 1 : 0, result);
                 EXPECT_EQ(failing ? kOld : kNew, zkReadFile(box.real(t)));
                 EXPECT_EQ(mode, statOf(box.real(t)).st_mode);

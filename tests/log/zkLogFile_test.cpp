@@ -1,7 +1,5 @@
 // zkLogFile: the line format, levels, numbering, echo, clearing and
 // concurrent writers.
-#include "zkLogFile.h"
-
 #include <gtest/gtest.h>
 #include <unistd.h>
 
@@ -9,6 +7,7 @@
 #include <string>
 
 #include "support/zkTempDir.h"
+#include "zkLogFile.h"
 
 namespace {
 
@@ -90,9 +89,12 @@ TEST(LogFile, MessagesAndTheEchoAreWrittenVerbatim) {
 TEST(LogFile, MakeTDNumPadsWithSignedComparisons) {
     zkLogFile log;
     zkStringBase out("old");
-    const struct { long n; unsigned three; const char* text; } cases[] = {
-        {9, 0, "09"}, {10, 0, "10"}, {9, 1, "009"}, {10, 1, "010"}, {99, 1, "099"}, {100, 1, "100"}, {1234, 1, "1234"},
-        {-5, 0, "0-5"}, {-5, 1, "00-5"}, {-42, 0, "0-42"}};
+    const struct {
+        long n;
+        unsigned three;
+        const char* text;
+    } cases[] = {{9, 0, "09"},    {10, 0, "10"},     {9, 1, "009"},  {10, 1, "010"},  {99, 1, "099"},
+                 {100, 1, "100"}, {1234, 1, "1234"}, {-5, 0, "0-5"}, {-5, 1, "00-5"}, {-42, 0, "0-42"}};
     for (const auto& c : cases) {
         log.MakeTDNum(out, c.n, c.three);
         EXPECT_STREQ(c.text, out.data()) << c.n << " " << c.three;

@@ -1,15 +1,17 @@
 // Splitting a string with zkBStringTokenizer.
-#include "zkBStringTokenizer.h"
-#include "zkStringBase.h"
-
 #include <gtest/gtest.h>
 
 #include <string>
 #include <vector>
 
+#include "zkBStringTokenizer.h"
+#include "zkStringBase.h"
+
 namespace {
 
-zkStringBase str(const std::string& text) { return zkStringBase(text.data(), static_cast<unsigned>(text.size())); }
+zkStringBase str(const std::string& text) {
+    return zkStringBase(text.data(), static_cast<unsigned>(text.size()));
+}
 
 std::string text(const zkStringBase& s) {
     EXPECT_EQ('\0', s.data()[s.length()]);
@@ -21,14 +23,27 @@ std::string text(const zkStringBase& s) {
 // A source with k separator bytes gives k + 1 tokens; an empty source none.
 TEST(Tokenizer, OneMoreTokenThanSeparatorsReadAtEachCall) {
     const std::string crlf = text(zkBStringTokenizer::m_crlfToken), comma = text(zkBStringTokenizer::m_csvToken);
-    const struct { std::string source, seps; bool strip; std::vector<std::string> tokens; } cases[] = {
-        {"a,b,d", comma, false, {"a", "b", "d"}}, {"abc", comma, false, {"abc"}}, {"", comma, false, {}},
-        {"a,,b", comma, false, {"a", "", "b"}},   {",a", comma, false, {"", "a"}}, {"a,", comma, false, {"a", ""}},
-        {",,,", comma, false, {"", "", "", ""}},  {"x\r\ny", crlf, false, {"x", "", "y"}}, {"a,b", "", false, {"a,b"}},
-        {" a , b ", comma, true, {"a", "b"}},     {" a , b ", comma, false, {" a ", " b "}},
-        {" \t;\tx y\n;\r", ";", true, {"", "x y", ""}}, {"k=v;w", "=;", false, {"k", "v", "w"}},
+    const struct {
+        std::string source, seps;
+        bool strip;
+        std::vector<std::string> tokens;
+    } cases[] = {
+        {"a,b,d", comma, false, {"a", "b", "d"}},
+        {"abc", comma, false, {"abc"}},
+        {"", comma, false, {}},
+        {"a,,b", comma, false, {"a", "", "b"}},
+        {",a", comma, false, {"", "a"}},
+        {"a,", comma, false, {"a", ""}},
+        {",,,", comma, false, {"", "", "", ""}},
+        {"x\r\ny", crlf, false, {"x", "", "y"}},
+        {"a,b", "", false, {"a,b"}},
+        {" a , b ", comma, true, {"a", "b"}},
+        {" a , b ", comma, false, {" a ", " b "}},
+        {" \t;\tx y\n;\r", ";", true, {"", "x y", ""}},
+        {"k=v;w", "=;", false, {"k", "v", "w"}},
         {"one two", text(zkBStringTokenizer::m_spToken), false, {"one", "two"}},
-        {{"a\0b", 3}, {"\0", 1}, false, {"a", "b"}}, {{"a\0b", 3}, comma, false, {{"a\0b", 3}}},
+        {{"a\0b", 3}, {"\0", 1}, false, {"a", "b"}},
+        {{"a\0b", 3}, comma, false, {{"a\0b", 3}}},
     };
     for (const auto& c : cases) {
         const zkStringBase source = str(c.source), seps = str(c.seps);

@@ -1,12 +1,12 @@
 // Number conversion, case changes and whitespace handling of zkStringBase.
-#include "zkStringBase.h"
-
 #include <gtest/gtest.h>
 
 #include <cfloat>
 #include <cstdio>
 #include <string>
 #include <utility>
+
+#include "zkStringBase.h"
 
 namespace {
 
@@ -38,22 +38,37 @@ TEST(StringConvert, NumbersToAndFromText) {
     // isNumber accepts only whole decimal numbers.
     for (const char* text : {"42", " -7", "\t 5", "3.", ".5", "1e5", "1E-3", "2e+", "1e-", "-1e-5", "+0.5e+10"})
         EXPECT_TRUE(zkStringBase(text).isNumber()) << '\'' << text << '\'';
-    for (const char* text : {"", " ", ".", "-", "5 ", "1.2.3", "1e5.2", "1e2e3", "e5", "+-1", "1,5", "0x1F", "1e",
-                             "5-", "1-2", "-.5", "\n5", "1e5+", ". 5", "1.e", "\xb5"})
+    for (const char* text : {"",     " ",  ".",  "-",   "5 ",  "1.2.3", "1e5.2", "1e2e3", "e5",  "+-1", "1,5",
+                             "0x1F", "1e", "5-", "1-2", "-.5", "\n5",   "1e5+",  ". 5",   "1.e", "\xb5"})
         EXPECT_FALSE(zkStringBase(text).isNumber()) << '\'' << text << '\'';
-    EXPECT_FALSE(zkStringBase("12\0" "3", 4).isNumber());
+    EXPECT_FALSE(zkStringBase("12\0"
+                              "3",
+                              4)
+                     .isNumber());
 }
 
 TEST(StringText, WhitespaceAndCaseRules) {
-    const struct { const char* text; unsigned pos, expected; } skips[] = {
+    const struct {
+        const char* text;
+        unsigned pos, expected;
+    } skips[] = {
         {" \t\r\nx", 0, 4}, {"   ", 0, 3}, {"abc", 9, 9}, {"a b", 1, 2}, {"\vx", 0, 0}, {"\fx", 0, 0}, {"", 0, 0},
     };
     for (const auto& c : skips) EXPECT_EQ(c.expected, zkStringBase(c.text).skipNextWhite(c.pos)) << c.text;
 
-    const struct { const char* text; zkStringBase::StripType bits; const char* expected; } strips[] = {
-        {"  a b  ", S::StripEnds, "a b"}, {"  a b  ", S::StripAll, "ab"}, {"   ", S::StripTrailing, ""},
-        {"   ", S::StripLeading, ""},     {"a  ", S::StripLeading, "a  "}, {" a ", S::StripTrailing, " a"},
-        {" \t\r\n\v\fa\v b\f", S::StripEnds, "a\v b"}, {"", S::StripEnds, ""},
+    const struct {
+        const char* text;
+        zkStringBase::StripType bits;
+        const char* expected;
+    } strips[] = {
+        {"  a b  ", S::StripEnds, "a b"},
+        {"  a b  ", S::StripAll, "ab"},
+        {"   ", S::StripTrailing, ""},
+        {"   ", S::StripLeading, ""},
+        {"a  ", S::StripLeading, "a  "},
+        {" a ", S::StripTrailing, " a"},
+        {" \t\r\n\v\fa\v b\f", S::StripEnds, "a\v b"},
+        {"", S::StripEnds, ""},
         {" a\tb ", S::StripLeading | S::StripAll, "ab"},
     };
     for (const auto& c : strips) EXPECT_EQ(c.expected, bytes(S(c.text).stripWhite(c.bits))) << c.text << c.bits;

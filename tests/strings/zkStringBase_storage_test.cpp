@@ -1,12 +1,12 @@
 // Construction, the growth rule, assignment and editing of zkStringBase.
-#include "zkStringBase.h"
-
 #include <gtest/gtest.h>
 
 #include <climits>
 #include <cstring>
 #include <new>
 #include <string>
+
+#include "zkStringBase.h"
 
 namespace {
 
@@ -23,16 +23,29 @@ std::string bytes(const zkStringBase& s) {
 // Counts the calls of resize(), to prove that all growth goes through it.
 struct CountingString : zkStringBase {
     using zkStringBase::zkStringBase;
-    void resize(unsigned n) override { ++calls; zkStringBase::resize(n); }
+    void resize(unsigned n) override {
+        ++calls;
+        zkStringBase::resize(n);
+    }
     unsigned calls = 0;
 };
 
 }  // namespace
 
 TEST(StringConstruction, CapacitiesCopiesAndAdoptedBuffers) {
-    const struct { zkStringBase s; std::string text; unsigned capacity; } cases[] = {
-        {S(), "", kSlack},         {S("abc"), "abc", 3 + kSlack}, {S("abc", 0), "", kSlack}, {S(nullptr), "", kSlack},
-        {S(nullptr, 5), "", kSlack}, {S("a\0b", 3), {"a\0b", 3}, 3 + kSlack}, {S(16u), "", 16},   {S(0u), "", 1},
+    const struct {
+        zkStringBase s;
+        std::string text;
+        unsigned capacity;
+    } cases[] = {
+        {S(), "", kSlack},
+        {S("abc"), "abc", 3 + kSlack},
+        {S("abc", 0), "", kSlack},
+        {S(nullptr), "", kSlack},
+        {S(nullptr, 5), "", kSlack},
+        {S("a\0b", 3), {"a\0b", 3}, 3 + kSlack},
+        {S(16u), "", 16},
+        {S(0u), "", 1},
     };
     for (const auto& c : cases) {
         EXPECT_EQ(c.text, bytes(c.s));
@@ -75,11 +88,27 @@ TEST(StringGrowth, OneGrowthAtThe128thCharacterThroughResize) {
 // a growth adds the slack to what is needed and goes through resize(), and
 // nothing else reallocates. Capacity 0: not checked.
 TEST(StringEditing, EditsClampTheirRangesAndGrowByTheRule) {
-    const struct { const char* start; unsigned room; Op op; std::string text; unsigned capacity, resizes; } cases[] = {
-        {"", 4, [](S& s) { s = "abc"; }, "abc", 4, 0},   {"", 4, [](S& s) { s = "abcd"; }, "abcd", 4 + kSlack, 1},
-        {"", 2, [](S& s) { s = 'x'; }, "x", 2, 0},       {"", 1, [](S& s) { s = 'x'; }, "x", 1 + kSlack, 1},
-        {"abc", 8, [](S& s) { for (char c : std::string("defg")) s.fappend(c); }, "abcdefg", 8, 0},
-        {"abc", 8, [](S& s) { for (char c : std::string("defgh")) s.fappend(c); }, "abcdefgh", 9 + kSlack, 1},
+    const struct {
+        const char* start;
+        unsigned room;
+        Op op;
+        std::string text;
+        unsigned capacity, resizes;
+    } cases[] = {
+        {"", 4, [](S& s) { s = "abc"; }, "abc", 4, 0},
+        {"", 4, [](S& s) { s = "abcd"; }, "abcd", 4 + kSlack, 1},
+        {"", 2, [](S& s) { s = 'x'; }, "x", 2, 0},
+        {"", 1, [](S& s) { s = 'x'; }, "x", 1 + kSlack, 1},
+        {"abc", 8,
+         [](S& s) {
+             for (char c : std::string("defg")) s.fappend(c);
+         },
+         "abcdefg", 8, 0},
+        {"abc", 8,
+         [](S& s) {
+             for (char c : std::string("defgh")) s.fappend(c);
+         },
+         "abcdefgh", 9 + kSlack, 1},
         {"ac", 3, [](S& s) { s.insert("b", 1); }, "abc", 4 + kSlack, 1},
         {"v=", 3, [](S& s) { s += -1e300; }, "v=" + std::to_string(-1e300), 0, 1},
         {"", 2, [](S& s) { s.fromDouble(1e300, 6); }, std::to_string(1e300), 0, 1},
@@ -89,15 +118,21 @@ TEST(StringEditing, EditsClampTheirRangesAndGrowByTheRule) {
         {"abab", 5, [](S& s) { s.insert(s.data(), 1, 2); }, "aabbab", 0, 1},
         {"abcd", 0, [](S& s) { s = s.data() + 2; }, "cd", 0, 0},
         // Below length + 1 a request is clamped, never losing text.
-        {"abc", 8, [](S& s) { s.reserve(2); }, "abc", 4, 1}, {"abc", 8, [](S& s) { s.resize(0); }, "abc", 4, 1},
+        {"abc", 8, [](S& s) { s.reserve(2); }, "abc", 4, 1},
+        {"abc", 8, [](S& s) { s.resize(0); }, "abc", 4, 1},
         {"x", 0, [](S& s) { s.append("", 0).append(nullptr, 5).prepend(nullptr).insert(nullptr, 0); }, "x", 0, 0},
-        {"x", 0, [](S& s) { s.append("ab", 1).append("cd\0e", 0).append(S("\0z", 2)).append('\0'); },
-         {"xacd\0z\0", 7}, 0, 0},
+        {"x",
+         0,
+         [](S& s) { s.append("ab", 1).append("cd\0e", 0).append(S("\0z", 2)).append('\0'); },
+         {"xacd\0z\0", 7},
+         0,
+         0},
         {"cd", 0, [](S& s) { s.prepend("ab").prepend('>').prepend(S("\0", 1)); }, {"\0>abcd", 6}, 0, 0},
         {"abc", 0, [](S& s) { s.insert("xy", 1).insert("xy", 0, 0).insert("<>", 99, 1); }, "xyaxybc<", 0, 0},
         {"abc", 0, [](S& s) { s.insert(S("1\0", 2), 2).insert(S("0"), 0); }, {"0ab1\0c", 6}, 0, 0},
         {"abcdef", 0, [](S& s) { s.del(1, 2).del(4, 2).del(4, 12).del(3, 3).erase(1, S::BadIndex); }, "a", 0, 0},
-        {"abc", 0, [](S& s) { s.cut(2).cut(0); }, "a", 0, 0}, {"abc", 0, [](S& s) { s.cut(10); }, "", 3 + kSlack, 0},
+        {"abc", 0, [](S& s) { s.cut(2).cut(0); }, "a", 0, 0},
+        {"abc", 0, [](S& s) { s.cut(10); }, "", 3 + kSlack, 0},
         {"abcb", 0, [](S& s) { s.replace("b", "XY", 0, true).replace("b", nullptr, 3, true); }, "aXYc", 0, 0},
         {"aXYcb", 0, [](S& s) { s.replace("xy", "-", 0, true).replace("xy", "-", 0, false); }, "a-cb", 0, 0},
         {"abcd", 0, [](S& s) { s.replace("X", 1, 2).replace(S("<>"), 0, 0).replace("Z", 5, 9); }, "<>XdZ", 0, 0},
@@ -119,10 +154,13 @@ TEST(StringEditing, EditsClampTheirRangesAndGrowByTheRule) {
 
 TEST(StringLimits, LengthPastThirtyTwoBitsThrowsAndKeepsText) {
     const Op ops[] = {
-        [](S& s) { s.append("y", 0xFFFFFFFFu); },     [](S& s) { s.append("y", 0xFFFFFFFDu); },
-        [](S& s) { s.prepend("y", 0xFFFFFFFEu); },    [](S& s) { s.insert("y", 1, 0xFFFFFFFDu); },
+        [](S& s) { s.append("y", 0xFFFFFFFFu); },
+        [](S& s) { s.append("y", 0xFFFFFFFDu); },
+        [](S& s) { s.prepend("y", 0xFFFFFFFEu); },
+        [](S& s) { s.insert("y", 1, 0xFFFFFFFDu); },
         // Also when the source lies in the string's own buffer.
-        [](S& s) { s.append(s.data(), 0xFFFFFFFFu); }, [](S& s) { s.insert(s.data(), 1, 0xFFFFFFFEu); },
+        [](S& s) { s.append(s.data(), 0xFFFFFFFFu); },
+        [](S& s) { s.insert(s.data(), 1, 0xFFFFFFFEu); },
     };
     for (Op op : ops) {
         zkStringBase s("xz");

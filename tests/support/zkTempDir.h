@@ -8,8 +8,8 @@
 #include <ftw.h>
 #include <signal.h>
 #include <stdio.h>
-#include <sys/resource.h>
 #include <stdlib.h>
+#include <sys/resource.h>
 #include <unistd.h>
 
 #include <fstream>

@@ -1,6 +1,4 @@
 // Parsing and ordering versions with zkVersionDescriptor.
-#include "zkVersionDescriptor.h"
-
 #include <gtest/gtest.h>
 
 #include <climits>
@@ -9,15 +7,27 @@
 #include <utility>
 #include <vector>
 
+#include "zkVersionDescriptor.h"
+
 // Text of any length, with or without a full stop, numbers clamped to 32 bits,
 // each read from a heap buffer of its exact size so that a read past the end
 // is caught. Unparsable text leaves the version alone.
 TEST(VersionDescriptor, ParsesText) {
     const std::pair<const char*, std::tuple<int, int, char>> rows[] = {
-        {"123456789.123456789z", {123456789, 123456789, 'z'}}, {"12345678901234567890", {INT_MAX, 0, 0}},
-        {"1.99999999999", {1, INT_MAX, '9'}}, {"-99999999999.1", {INT_MIN, 1, 0}}, {"7.5 beta", {7, 5, ' '}},
-        {"1.10a", {1, 10, '0'}}, {"1.2.3", {1, 2, '.'}}, {"2.1a", {2, 1, 'a'}}, {"1.-2", {1, 0, '2'}},
-        {"", {9, 9, 0}}, {nullptr, {9, 9, 0}}, {"2.", {2, 0, 0}}, {".5", {9, 9, 0}}, {"5", {5, 0, 0}},
+        {"123456789.123456789z", {123456789, 123456789, 'z'}},
+        {"12345678901234567890", {INT_MAX, 0, 0}},
+        {"1.99999999999", {1, INT_MAX, '9'}},
+        {"-99999999999.1", {INT_MIN, 1, 0}},
+        {"7.5 beta", {7, 5, ' '}},
+        {"1.10a", {1, 10, '0'}},
+        {"1.2.3", {1, 2, '.'}},
+        {"2.1a", {2, 1, 'a'}},
+        {"1.-2", {1, 0, '2'}},
+        {"", {9, 9, 0}},
+        {nullptr, {9, 9, 0}},
+        {"2.", {2, 0, 0}},
+        {".5", {9, 9, 0}},
+        {"5", {5, 0, 0}},
     };
     for (const auto& row : rows) {
         const std::vector<char> text(row.first, row.first + (row.first ? std::strlen(row.first) + 1 : 0));
@@ -35,7 +45,8 @@ TEST(VersionDescriptor, OrderingAndLines) {
     for (int i = 0; i < 9; ++i)
         for (int j = 0; j < 9; ++j) {
             const zkVersionDescriptor a(ascending[i]), b(ascending[j]);
-            EXPECT_EQ(std::make_tuple(i < j, i > j, i == j, line[i] == line[j]),
-                      std::make_tuple(a < b, a > b, a == b, a.IsInline(b))) << ascending[i] << " " << ascending[j];
+            EXPECT_EQ(std::make_tuple(i<j, i> j, i == j, line[i] == line[j]),
+                      std::make_tuple(a<b, a> b, a == b, a.IsInline(b)))
+                << ascending[i] << " " << ascending[j];
         }
 }

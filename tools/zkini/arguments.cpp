@@ -12,10 +12,10 @@ struct SwitchSpelling {
 
 // Indexed by Arguments::Switch.
 const SwitchSpelling kSwitches[Arguments::SwitchCount] = {
-    {"get", false},     {"set", false},      {"delete", false}, {"list", false}, {"normalize", false},
-    {"firewall", false}, {"merge", true},     {"batch", true},   {"version", false}, {"help", false},
-    {"file", true},     {"section", true},   {"key", true},     {"value", true},  {"out", true},
-    {"log", true},      {"format", true},    {"existing", false}, {"quiet", false},
+    {"get", false},      {"set", false},    {"delete", false},   {"list", false},    {"normalize", false},
+    {"firewall", false}, {"merge", true},   {"batch", true},     {"version", false}, {"help", false},
+    {"file", true},      {"section", true}, {"key", true},       {"value", true},    {"out", true},
+    {"log", true},       {"format", true},  {"existing", false}, {"quiet", false},
 };
 
 // Whole words that name a bare switch besides "-" and its name.
@@ -23,10 +23,11 @@ struct Alias {
     const char* word;
     Arguments::Switch as;
 };
-const Alias kAliases[] = {
-    {"--help", Arguments::Help}, {"-h", Arguments::Help}, {"--version", Arguments::Version}};
+const Alias kAliases[] = {{"--help", Arguments::Help}, {"-h", Arguments::Help}, {"--version", Arguments::Version}};
 
-constexpr unsigned bit(Arguments::Switch s) { return 1u << s; }
+constexpr unsigned bit(Arguments::Switch s) {
+    return 1u << s;
+}
 
 constexpr unsigned kActions = bit(Arguments::Get) | bit(Arguments::Set) | bit(Arguments::Delete) |
                               bit(Arguments::List) | bit(Arguments::Normalize) | bit(Arguments::Firewall) |
@@ -46,10 +47,11 @@ constexpr unsigned kSectionKey = bit(Arguments::Section) | bit(Arguments::Key);
 // Indexed by the action's Switch value.
 const ActionRule kRules[] = {
     /* Get */ {kFileQuiet | kSectionKey | bit(Arguments::Format), bit(Arguments::File) | kSectionKey},
-    /* Set */ {kFileQuiet | kSectionKey | bit(Arguments::Value) | bit(Arguments::Existing) | kWrites,
-               bit(Arguments::File) | kSectionKey | bit(Arguments::Value)},
-    /* Delete */ {kFileQuiet | kSectionKey | bit(Arguments::Existing) | kWrites,
-                  bit(Arguments::File) | bit(Arguments::Section)},
+    /* Set */
+    {kFileQuiet | kSectionKey | bit(Arguments::Value) | bit(Arguments::Existing) | kWrites,
+     bit(Arguments::File) | kSectionKey | bit(Arguments::Value)},
+    /* Delete */
+    {kFileQuiet | kSectionKey | bit(Arguments::Existing) | kWrites, bit(Arguments::File) | bit(Arguments::Section)},
     /* List */ {kFileQuiet | bit(Arguments::Section) | bit(Arguments::Format), bit(Arguments::File)},
     /* Normalize */ {kFileQuiet | kWrites, bit(Arguments::File)},
     /* Firewall */ {kFileQuiet | kWrites, bit(Arguments::File)},
@@ -97,8 +99,7 @@ int Arguments::CheckWord(const char* word) {
     const size_t nameLength = colon ? static_cast<size_t>(colon - word - 1) : std::strlen(word + 1);
     unsigned found = SwitchCount;
     for (unsigned s = 0; s < SwitchCount; ++s)
-        if (std::strlen(kSwitches[s].name) == nameLength &&
-            std::strncmp(kSwitches[s].name, word + 1, nameLength) == 0)
+        if (std::strlen(kSwitches[s].name) == nameLength && std::strncmp(kSwitches[s].name, word + 1, nameLength) == 0)
             found = s;
     if (!colon)
         for (const Alias& alias : kAliases)
@@ -122,8 +123,9 @@ int Arguments::CheckCombination() {
         action = s;
     }
     if (action == SwitchCount)
-        return Refuse({"no action given: one of -get, -set, -delete, -list, -merge:, -batch:, -normalize, "
-                       "-firewall"});
+        return Refuse(
+            {"no action given: one of -get, -set, -delete, -list, -merge:, -batch:, -normalize, "
+             "-firewall"});
     m_action = static_cast<Switch>(action);
     const ActionRule& rule = kRules[action];
     for (unsigned s = 0; s < SwitchCount; ++s) {

@@ -17,8 +17,26 @@ class Arguments : public zkCommandLineParser {
 public:
     // The actions come first; -merge: and -batch: are actions that take a value.
     enum Switch : unsigned {
-        Get, Set, Delete, List, Normalize, Firewall, Merge, Batch, Version, Help,
-        File, Section, Key, Value, Out, Log, Format, Existing, Quiet, SwitchCount
+        Get,
+        Set,
+        Delete,
+        List,
+        Normalize,
+        Firewall,
+        Merge,
+        Batch,
+        Version,
+        Help,
+        File,
+        Section,
+        Key,
+        Value,
+        Out,
+        Log,
+        Format,
+        Existing,
+        Quiet,
+        SwitchCount
     };
 
     // Borrows argv as the library's parser does; nothing is read yet.

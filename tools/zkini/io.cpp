@@ -27,7 +27,9 @@ int readAll(int fd, zkStringBase& text) {
 
 }  // namespace
 
-bool IsStdStream(const zkStringBase& path) { return path == "-"; }
+bool IsStdStream(const zkStringBase& path) {
+    return path == "-";
+}
 
 int ReadPath(const zkStringBase& path, zkStringBase& text) {
     if (IsStdStream(path)) return readAll(STDIN_FILENO, text);

@@ -24,7 +24,6 @@
 #include "zkStringBase.h"
 #include "zkutilVersion.h"
 
-
 namespace {
 
 enum ExitStatus { Done = 0, Missing = 1, Usage = 2, FileFailure = 3 };
@@ -138,15 +137,24 @@ private:
 
 int Tool::Run() {
     switch (m_args.GetAction()) {
-    case Arguments::Get: return Get();
-    case Arguments::List: return List();
-    case Arguments::Set: return Set();
-    case Arguments::Delete: return Delete();
-    case Arguments::Merge: return Merge();
-    case Arguments::Batch: return Batch();
-    case Arguments::Normalize: return Rewrite(false);
-    case Arguments::Firewall: return Rewrite(true);
-    case Arguments::Version: return printVersion();
+    case Arguments::Get:
+        return Get();
+    case Arguments::List:
+        return List();
+    case Arguments::Set:
+        return Set();
+    case Arguments::Delete:
+        return Delete();
+    case Arguments::Merge:
+        return Merge();
+    case Arguments::Batch:
+        return Batch();
+    case Arguments::Normalize:
+        return Rewrite(false);
+    case Arguments::Firewall:
+        return Rewrite(true);
+    case Arguments::Version:
+        return printVersion();
     default:
         std::fputs(kUsage, stdout);
         return std::fflush(stdout) == 0 ? Done : fileError("write", "standard output", errno);
