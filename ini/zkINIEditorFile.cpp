@@ -44,12 +44,7 @@ bool readAll(int fd, std::unique_ptr<char[]>& bytes, size_t& size) {
     bytes.reset(new char[room]);
     size = 0;
     for (;;) {
-        if (size == room) {
-            std::unique_ptr<char[]> larger(new char[2 * room]);
-            std::memcpy(larger.get(), bytes.get(), size);
-            bytes.swap(larger);
-            room *= 2;
-        }
+        if (size == room) zkDoubleBuffer(bytes, room, size);
         ssize_t n = read(fd, bytes.get() + size, room - size);
         if (n < 0 && errno == EINTR) continue;
         if (n < 0) return false;

@@ -7,6 +7,7 @@
 #include <cstring>
 #include <memory>
 
+#include "internal/zkFileSystem.h"
 #include "internal/zkOutOfMemory.h"
 #include "internal/zkStringRules.h"
 #include "zkBasicFile.h"
@@ -91,12 +92,7 @@ bool scanInBlocks(zkBasicFile& file, SectionBuilder& builder) {
     bool started = false;
     for (;;) {
         // A line longer than the buffer makes it grow.
-        if (held == size) {
-            std::unique_ptr<char[]> larger(new char[2 * size]);
-            std::memcpy(larger.get(), buffer.get(), held);
-            buffer.swap(larger);
-            size *= 2;
-        }
+        if (held == size) zkDoubleBuffer(buffer, size, held);
         unsigned long got = 0;
         if (file.Read(buffer.get() + held, size - held, &got) != 0) {
             if (errno == EINTR) continue;

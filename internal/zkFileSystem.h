@@ -15,7 +15,9 @@
 #include <sys/stat.h>
 #include <sys/types.h>
 
+#include <cstring>
 #include <functional>
+#include <memory>
 #include <string>
 
 // Keeps errno across cleanup calls that may change it, so a failure's errno
@@ -34,6 +36,15 @@ private:
 // Whether two stat results describe the same file.
 inline bool zkSameFile(const struct stat& a, const struct stat& b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
+// Doubles a read buffer of size bytes that is full, keeping its first kept
+// bytes; size becomes the new size.
+inline void zkDoubleBuffer(std::unique_ptr<char[]>& buffer, size_t& size, size_t kept) {
+    std::unique_ptr<char[]> larger(new char[2 * size]);
+    std::memcpy(larger.get(), buffer.get(), kept);
+    buffer.swap(larger);
+    size *= 2;
 }
 
 // Writes the new contents to the descriptor; false on failure, errno set.
