@@ -187,6 +187,22 @@ int copyLink(const std::string& from, const std::string& to, const Options& opti
     return 0;
 }
 
+// Copies one entry of a directory copy: the number of entries that failed,
+// 0 when it was copied or passed by.
+int copyEntry(const std::string& from, const std::string& to, const Options& options, OutermostDestination& outermost) {
+    struct stat st;
+    if (lstat(from.c_str(), &st) != 0) return 1;
+    bool link = S_ISLNK(st.st_mode);
+    bool directory = link ? zkFilename::IsDirectory(from.c_str()) != 0 : S_ISDIR(st.st_mode);
+    if (directory && !options.recursive) return 0;
+    if (directory && link) return copyLink(from, to, options);
+    if (directory && st.st_dev == outermost.dev && st.st_ino == outermost.ino) return 0;
+    // Entry names are taken literally: a name holding '*' or '?' is one file.
+    zkFilename entry(from.c_str());
+    zkFilename target(to.c_str());
+    return copyOne(entry, target, options, outermost);
+}
+
 // The directory copy: destination becomes a directory and receives every
 // entry of source's directory that matches source's name part.
 int copyEntries(zkFilename& source, zkFilename& destination, const Options& options, OutermostDestination& outermost) {
@@ -213,25 +229,7 @@ int copyEntries(zkFilename& source, zkFilename& destination, const Options& opti
     for (zkDirIterator it(source.GetFullPath()), end; it != end; ++it) {
         const char* name = it.GetName();
         if (std::strcmp(name, ".") == 0 || std::strcmp(name, "..") == 0) continue;
-        std::string from = sourceDir + name;
-        std::string to = destinationDir + name;
-        struct stat st;
-        if (lstat(from.c_str(), &st) != 0) {
-            ++failed;
-            continue;
-        }
-        bool link = S_ISLNK(st.st_mode);
-        bool directory = link ? zkFilename::IsDirectory(from.c_str()) != 0 : S_ISDIR(st.st_mode);
-        if (directory && !options.recursive) continue;
-        if (directory && link) {
-            failed += copyLink(from, to, options);
-            continue;
-        }
-        if (directory && st.st_dev == outermost.dev && st.st_ino == outermost.ino) continue;
-        // Entry names are taken literally: a name holding '*' or '?' is one file.
-        zkFilename entry(from.c_str());
-        zkFilename target(to.c_str());
-        failed += copyOne(entry, target, options, outermost);
+        failed += copyEntry(sourceDir + name, destinationDir + name, options, outermost);
     }
     return failed;
 }
