@@ -102,13 +102,15 @@ enum class Outcome { Done, Failed, NotHere };
 // once whole: at every moment the name holds the whole old file or the whole
 // new one. NotHere, with nothing left behind, when the directory admits no
 // new file or refuses the rename. An existing file's replacement is private
-// until it holds the old file's mode; a new file's mode is the caller's
-// (less the umask), as there is no old content to guard.
+// until it holds the old file's mode, and is flushed before the rename, so
+// that a crash cannot leave a name whose old bytes are gone and whose new
+// ones never reached the disk. A new file's mode is the caller's (less the
+// umask), and it is not flushed: there is no old content to guard.
 Outcome replaceBeside(const std::string& target, const struct stat* old, mode_t newMode, const zkContentWriter& write) {
     std::string temp;
     int fd = createBeside(target, old ? kPrivateMode : newMode, temp);
     if (fd == -1) return refusedHere(errno) ? Outcome::NotHere : Outcome::Failed;
-    int failed = old && takeOverMode(fd, *old) != 0 ? fail(fd) : writeAndClose(fd, write, true);
+    int failed = old && takeOverMode(fd, *old) != 0 ? fail(fd) : writeAndClose(fd, write, old != nullptr);
     if (!failed && rename(temp.c_str(), target.c_str()) != 0) failed = refusedHere(errno) ? 2 : 1;
     if (failed) {
         zkErrnoKeeper keep;

@@ -78,7 +78,8 @@ void zkSyncDirectoryOf(const std::string& path);
 // process may write the old file, it is rewritten in place so that a
 // failure writes the old bytes back. sizeHint (0: unknown) is the size the
 // new contents will have; the in-place path reserves it before overwriting.
-// A missing file is made the same way with newMode (the umask applies).
+// A missing file is made the same way with newMode (the umask applies) and
+// not flushed before the rename: no old content is at stake.
 // Devices, FIFOs and other files that are not regular are written through.
 //
 // On failure the old file is as it was, byte for byte, and no temporary
