@@ -118,27 +118,33 @@ TEST(IniEditorLock, LockIsHeldFromOpenUntilClose) {
 }
 
 // A missing file: create reads it as empty, and the lock makes it; without
-// create it is an error.
-TEST(IniEditorLock, MissingFile) {
+// create it is an error. A failed Open holds no lock, so a second one fails
+// the same way.
+TEST(IniEditorLock, OpenFailures) {
     const struct {
+        const char* name;
         bool create, lock;
         int result, error;
         bool made;
     } rows[] = {
-        {false, false, zkINIEditor::FileError, ENOENT, false},
-        {false, true, zkINIEditor::FileError, ENOENT, false},
-        {true, false, zkINIEditor::Done, 0, false},
-        {true, true, zkINIEditor::Done, 0, true},
+        {"new.ini", false, false, zkINIEditor::FileError, ENOENT, false},
+        {"new.ini", false, true, zkINIEditor::FileError, ENOENT, false},
+        {"new.ini", true, false, zkINIEditor::Done, 0, false},
+        {"new.ini", true, true, zkINIEditor::Done, 0, true},
+        {"", false, true, zkINIEditor::FileError, EISDIR, true},
     };
     for (const auto& row : rows) {
-        SCOPED_TRACE(std::to_string(row.create) + std::to_string(row.lock));
+        SCOPED_TRACE(std::string(row.name) + std::to_string(row.create) + std::to_string(row.lock));
         zkTempDir dir;
-        const std::string path = dir.file("new.ini");
-        zkINIEditor editor(path.c_str());
-        const int result = editor.Open(row.create, row.lock);
-        const int error = result == zkINIEditor::FileError ? errno : 0;
-        EXPECT_EQ(row.result, result);
-        EXPECT_EQ(row.error, error);
-        EXPECT_EQ(row.made, access(path.c_str(), F_OK) == 0);
+        const std::string path = dir.file(row.name);
+        for (int attempt = 0; attempt < 2; ++attempt) {
+            zkINIEditor editor(path.c_str());
+            errno = 0;
+            const int result = editor.Open(row.create, row.lock, 0);
+            const int error = errno;
+            EXPECT_EQ(row.result, result);
+            EXPECT_EQ(row.error, result == zkINIEditor::Done ? 0 : error);
+            EXPECT_EQ(row.made, access(path.c_str(), F_OK) == 0);
+        }
     }
 }

@@ -15,8 +15,10 @@ TEST(IniAccess, LookupsSetAndRemove) {
     EXPECT_EQ("; note", zkText(ini.GetVal(zkStr("net"), zkStr(""))));
     EXPECT_EQ(&zkStringBase::NullStr, &ini.GetVal(zkStr("net"), zkStr("port")));
     zkStringBase out("untouched");
-    EXPECT_TRUE(ini.GetVal(zkStr("net"), zkStr("none"), out) == 1 && zkText(out) == "untouched");
-    EXPECT_TRUE(ini.GetVal(zkStr("OTHER"), zkStr("K"), out) == 0 && zkText(out) == "1");
+    EXPECT_EQ(1, ini.GetVal(zkStr("net"), zkStr("none"), out));
+    EXPECT_EQ("untouched", zkText(out));
+    EXPECT_EQ(0, ini.GetVal(zkStr("OTHER"), zkStr("K"), out));
+    EXPECT_EQ("1", zkText(out));
 
     // SetVal visits every section of the name: in place where the key is,
     // the stored key keeping its case, else appended after the comments.
@@ -40,7 +42,8 @@ TEST(IniAccess, MergeFromLetsTheOtherDocumentWin) {
     const std::string merged = "[main]\nc:; defaults\nk:a|1\nk:b|20\nk:c|4\nk:d|5\n[keep]\nk:x|0\n[extra]\nk:y|1\n";
     EXPECT_EQ(merged, zkDump(base));
     EXPECT_EQ(overBefore, zkDump(over));
-    EXPECT_TRUE(base.MergeFrom(base) == 0 && zkDump(base) == merged) << zkDump(base);
+    EXPECT_EQ(0, base.MergeFrom(base));
+    EXPECT_EQ(merged, zkDump(base));
 
     base.AddMapSection(zkStr("keep"), over.GetPropertyList("main"));
     base.AddMapSection(zkStr("bare"), nullptr);

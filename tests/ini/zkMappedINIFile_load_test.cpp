@@ -11,7 +11,7 @@ TEST(IniLoad, ReadingRules) {
     const std::string crlf = zkTestData("crlf.ini");
     const char* const crlfDump =
         "[Main]\nk:host|example.org\nk:port|8080\nc:# a comment\nk:empty|\n[Other]\nk:flag|\nk:k|a = b\n";
-    const std::pair<std::string, const char*> cases[] = {
+    const std::pair<std::string, const char*> rows[] = {
         {crlf, crlfDump},
         {std::regex_replace(crlf, std::regex("\r\n"), "\n"), crlfDump},
         {std::regex_replace(crlf, std::regex("\r\n"), "\r"), crlfDump},
@@ -21,38 +21,65 @@ TEST(IniLoad, ReadingRules) {
         {zkTestData("bom.ini"), "[first]\nk:name|one\n[second]\nk:name|two\n"},
         // One character, before or after blanks, is ignored; further "="
         // belong to the value; ";" inside a line is text.
-        {"[s]\na\n  b\nc \nd=\n  e = f g = h  \n=v\n;x\n\t# y ; z  \ni ; j=k\n\"q\" = 'r'\nz",
+        {zkTestData("short_lines.ini"),
          "[s]\nk:c|\nk:d|\nk:e|f g = h\nk:|v\nc:;x\nc:# y ; z\nk:i ; j|k\nk:\"q\"|'r'\n"},
+        {zkTestData("lone_characters.ini"), "[short]\nc:;\nc:#\nk:|\n"},
         {"", ""},
         {"\n\n  \r\n\t\r\r\n \n", ""},
     };
     zkTempDir dir;
-    for (const auto& c : cases) {
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.first);
         zkMappedINIFile ini;
-        ASSERT_EQ(0, zkLoad(ini, dir, "a.ini", c.first));
-        EXPECT_EQ(c.second, zkDump(ini)) << c.first;
+        ASSERT_EQ(0, zkLoad(ini, dir, "a.ini", row.first));
+        EXPECT_EQ(row.second, zkDump(ini));
     }
 }
 
-// Open appends to the document; a failed Open, a read error included, leaves
-// it as it was; Clear keeps the file name.
-TEST(IniLoad, OpenModesAndFailuresLeaveTheDocument) {
+// A failed Open, a read error included, leaves the document as it was and
+// makes no file.
+TEST(IniLoad, FailedOpenLeavesTheDocument) {
     zkTempDir dir;
     const std::string missing = dir.file("missing.ini");
-    zkMappedINIFile ini(missing.c_str());
+    const std::string tooLong = dir.path() + std::string(4096 - dir.path().size() - 5, '/') + "a.ini";
+    const struct {
+        std::string file;
+        unsigned create;
+    } rows[] = {
+        {missing, 0},
+        {dir.path(), 1},
+        // The process's own memory opens for reading and writing, but
+        // reading its first page fails.
+        {"/proc/self/mem", 1},
+        // A name of 4096 bytes is refused, not shortened to another file.
+        {tooLong, 0},
+    };
+    zkMappedINIFile ini;
     ini.SetVal(zkStr("keep"), zkStr("k"), zkStr("v"));
-    EXPECT_TRUE(ini.Open(0) == 1 && access(missing.c_str(), F_OK) != 0);
-    EXPECT_TRUE(ini.Open(1) == 0 && access(missing.c_str(), F_OK) == 0);
-    // The process's own memory opens for reading and writing, but reading
-    // its first page fails.
-    for (const std::string& name : {dir.path(), std::string("/proc/self/mem")}) {
-        ini.SetFilename(name.c_str());
-        EXPECT_EQ(1, ini.Open(1)) << name;
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.file);
+        ini.SetFilename(row.file.c_str());
+        EXPECT_EQ(1, ini.Open(row.create));
+        EXPECT_EQ("[keep]\nk:k|v\n", zkDump(ini));
     }
-    EXPECT_EQ("[keep]\nk:k|v\n", zkDump(ini));
+    EXPECT_NE(0, access(missing.c_str(), F_OK));
+}
 
-    ASSERT_TRUE(zkLoad(ini, dir, "a.ini", "[a]\nk=1\n") == 0 && ini.Open(0) == 0);
+// Open appends what it reads to the document; create makes a missing file;
+// Clear empties the document and keeps its file name.
+TEST(IniLoad, OpenAppendsToTheDocument) {
+    zkTempDir dir;
+    const std::string made = dir.file("made.ini");
+    zkMappedINIFile ini(made.c_str());
+    ini.SetVal(zkStr("keep"), zkStr("k"), zkStr("v"));
+    EXPECT_EQ(0, ini.Open(1));
+    EXPECT_EQ("", zkReadFile(made));
+    EXPECT_EQ(0, access(made.c_str(), F_OK));
+
+    ASSERT_EQ(0, zkLoad(ini, dir, "a.ini", "[a]\nk=1\n"));
+    ASSERT_EQ(0, ini.Open(0));
     EXPECT_EQ("[keep]\nk:k|v\n[a]\nk:k|1\n[a]\nk:k|1\n", zkDump(ini));
     ini.Clear();
-    EXPECT_TRUE(ini.Open(0) == 0 && zkDump(ini) == "[a]\nk:k|1\n");
+    ASSERT_EQ(0, ini.Open(0));
+    EXPECT_EQ("[a]\nk:k|1\n", zkDump(ini));
 }
