@@ -4,15 +4,8 @@
 
 #include <string>
 
+#include "support/zkStringText.h"
 #include "zkStringBase.h"
-
-namespace {
-
-zkStringBase str(const std::string& text) {
-    return zkStringBase(text.data(), static_cast<unsigned>(text.size()));
-}
-
-}  // namespace
 
 // The same tail behind a long filler that holds no match: the long search
 // finds what the short one finds, shifted by the filler. Bytes from 0x80 up
@@ -33,12 +26,13 @@ TEST(StringSearch, FoldedFindSkipsAheadWithoutMissingAMatch) {
         {"ba", "AB"},
     };
     for (const auto& c : cases) {
-        const zkStringBase shortText = str(c.tail), longText = str(filler + c.tail), pattern = str(c.pattern);
+        SCOPED_TRACE(c.tail);
+        const zkStringBase shortText = zkStr(c.tail), longText = zkStr(filler + c.tail), pattern = zkStr(c.pattern);
         const unsigned expected = shortText.find(pattern, 0, false);
         const unsigned shifted = expected == zkStringBase::BadIndex ? expected : expected + 4096u;
-        EXPECT_EQ(shifted, longText.find(pattern, 0, false)) << c.tail;
-        EXPECT_EQ(shifted, longText.find(pattern, 100, false)) << c.tail;
+        EXPECT_EQ(shifted, longText.find(pattern, 0, false));
+        EXPECT_EQ(shifted, longText.find(pattern, 100, false));
     }
-    EXPECT_EQ(4096u + 3u, str(filler + "zz Hello").find(str("HELLO"), 0, false));
-    EXPECT_EQ(zkStringBase::BadIndex, str(filler + "zz Hell").find(str("HELLO"), 0, false));
+    EXPECT_EQ(4096u + 3u, zkStr(filler + "zz Hello").find(zkStr("HELLO"), 0, false));
+    EXPECT_EQ(zkStringBase::BadIndex, zkStr(filler + "zz Hell").find(zkStr("HELLO"), 0, false));
 }

@@ -3,50 +3,67 @@
 
 #include <climits>
 #include <cstring>
-#include <tuple>
-#include <utility>
+#include <string>
 #include <vector>
 
 #include "zkVersionDescriptor.h"
+
+namespace {
+
+struct Fields {
+    int major, minor;
+    char subMinor;
+};
+
+void expectFields(const Fields& expected, const zkVersionDescriptor& v) {
+    EXPECT_EQ(expected.major, v.GetMajor());
+    EXPECT_EQ(expected.minor, v.GetMinor());
+    EXPECT_EQ(expected.subMinor, v.GetSubMinor());
+}
+
+}  // namespace
+
+TEST(VersionDescriptor, StartsAtZero) {
+    expectFields({0, 0, 0}, zkVersionDescriptor());
+    expectFields({0, 0, 0}, zkVersionDescriptor(nullptr));
+}
 
 // Text of any length, with or without a full stop, numbers clamped to 32 bits,
 // each read from a heap buffer of its exact size so that a read past the end
 // is caught. Unparsable text leaves the version alone.
 TEST(VersionDescriptor, ParsesText) {
-    const std::pair<const char*, std::tuple<int, int, char>> rows[] = {
-        {"123456789.123456789z", {123456789, 123456789, 'z'}},
-        {"12345678901234567890", {INT_MAX, 0, 0}},
-        {"1.99999999999", {1, INT_MAX, '9'}},
-        {"-99999999999.1", {INT_MIN, 1, 0}},
-        {"7.5 beta", {7, 5, ' '}},
-        {"1.10a", {1, 10, '0'}},
-        {"1.2.3", {1, 2, '.'}},
-        {"2.1a", {2, 1, 'a'}},
-        {"1.-2", {1, 0, '2'}},
-        {"", {9, 9, 0}},
-        {nullptr, {9, 9, 0}},
-        {"2.", {2, 0, 0}},
-        {".5", {9, 9, 0}},
-        {"5", {5, 0, 0}},
+    // clang-format off
+    const struct {
+        const char* text;
+        int major, minor;
+        char subMinor;
+    } rows[] = {
+        {"1.10a", 1, 10, '0'}, {"2.1a", 2, 1, 'a'}, {"1.2.3", 1, 2, '.'}, {"1.-2", 1, 0, '2'}, {"", 9, 9, 0},
+        {nullptr, 9, 9, 0}, {"2.", 2, 0, 0}, {".5", 9, 9, 0}, {"5", 5, 0, 0}, {"1234.5678z", 1234, 5678, 'z'},
+        {"1.9999999999", 1, INT_MAX, '9'}, {"-9999999999.1", INT_MIN, 1, 0}, {"9999999999", INT_MAX, 0, 0},
     };
+    // clang-format on
     for (const auto& row : rows) {
-        const std::vector<char> text(row.first, row.first + (row.first ? std::strlen(row.first) + 1 : 0));
+        SCOPED_TRACE(row.text ? row.text : "null");
+        const std::vector<char> text(row.text, row.text + (row.text ? std::strlen(row.text) + 1 : 0));
         zkVersionDescriptor v("9.9");
-        EXPECT_EQ(0, v.SetVersionDescriptor(row.first ? text.data() : nullptr));
-        EXPECT_EQ(row.second, std::make_tuple(v.GetMajor(), v.GetMinor(), v.GetSubMinor())) << row.first;
+        EXPECT_EQ(0, v.SetVersionDescriptor(row.text ? text.data() : nullptr));
+        expectFields({row.major, row.minor, row.subMinor}, v);
     }
 }
 
 // Major, then minor, then the sub-minor as a signed byte: a byte of 0x80 or
 // more comes before no sub-minor. Versions sharing major and minor are in line.
-TEST(VersionDescriptor, OrderingAndLines) {
+TEST(VersionDescriptor, Ordering) {
     const char* ascending[] = {"-1.0", "0.0", "1.2\x80", "1.2", "3.1", "3.1a", "3.1b", "3.2", "10.0"};
     const int line[] = {0, 1, 2, 2, 3, 3, 3, 4, 5};
     for (int i = 0; i < 9; ++i)
         for (int j = 0; j < 9; ++j) {
+            SCOPED_TRACE(std::string(ascending[i]) + " vs " + ascending[j]);
             const zkVersionDescriptor a(ascending[i]), b(ascending[j]);
-            EXPECT_EQ(std::make_tuple(i<j, i> j, i == j, line[i] == line[j]),
-                      std::make_tuple(a<b, a> b, a == b, a.IsInline(b)))
-                << ascending[i] << " " << ascending[j];
+            EXPECT_EQ(i < j, a < b);
+            EXPECT_EQ(i > j, a > b);
+            EXPECT_EQ(i == j, a == b);
+            EXPECT_EQ(line[i] == line[j], a.IsInline(b));
         }
 }
