@@ -6,16 +6,14 @@
 
 #include "zkCommandLineParser.h"
 
-namespace {
-
 // The values under names, joined by "|"; "<none>" stands for a missing entry.
-std::string entries(const zkCommandLineParser& p, std::initializer_list<const char*> names) {
+static std::string entries(const zkCommandLineParser& p, std::initializer_list<const char*> names) {
     std::string out;
     for (const char* n : names) out += "|" + std::string(p.Exists(zkStringBase(n)) ? p.GetValue(n).data() : "<none>");
     return out.substr(1);
 }
 
-char* arg(const char* s) {
+static char* arg(const char* s) {
     return const_cast<char*>(s);
 }
 
@@ -24,16 +22,11 @@ struct Refusing : zkCommandLineParser {
     int Validate() override { return 0; }
 };
 
-}  // namespace
-
 // Only spaces separate items; a switch before a switch stores nothing.
 TEST(CommandLineString, SwitchesBecomeEntries) {
-    const struct {
-        const char* command;
-        char switchChar, separator;
-        std::initializer_list<const char*> names;
-        const char* values;
-    } cases[] = {
+    // clang-format off
+    const struct { const char* command; char switchChar, separator; std::initializer_list<const char*> names;
+                   const char* values; } cases[] = {
         {"prog -in:data.ini -out:\"my file.ini\"", '-', ':', {"in", "out", "prog"}, "data.ini|my file.ini|<none>"},
         {"-n: 5 -n:6 -a:1-b:2", '-', ':', {"n", "a", "b"}, "6|1-b:2|<none>"},
         {"-v -x:1 -a:\"\" -b:\"x y", '-', ':', {"v -x", "x", "a", "b"}, "1|<none>||x y"},
@@ -43,6 +36,7 @@ TEST(CommandLineString, SwitchesBecomeEntries) {
         {"-a:-b:1 -c: -d:2", '-', ':', {"b", "ab", "a", "d", "c"}, "1|<none>|<none>|2|<none>"},
         {"/path=out -path=x /q=1", '/', '=', {"path", "q"}, "out|1"},
     };
+    // clang-format on
     for (const auto& c : cases) {
         SCOPED_TRACE(c.command);
         zkCommandLineParser p(zkStringBase(c.command), c.switchChar, c.separator);

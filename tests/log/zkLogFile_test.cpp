@@ -14,41 +14,31 @@
 #include "support/zkTempDir.h"
 #include "zkLogFile.h"
 
-namespace {
-
 using Level = zkLogFile::LogLevel;
 
-// The local clock as "HH:MM:SS MM/DD/YY".
-std::string stamp() {
-    std::time_t now = std::time(nullptr);
-    struct tm local;
-    char text[32];
-    std::strftime(text, sizeof text, "%H:%M:%S %m/%d/%y", localtime_r(&now, &local));
-    return text;
-}
-
-zkLogFile plainLog(const std::string& path) {
+static zkLogFile plainLog(const std::string& path) {
     zkLogFile log(zkStringBase(path.c_str()), 0);
     log.SetOption(zkLogFile::OptionTimeStamp, 0);
     return log;
 }
 
-}  // namespace
-
 TEST(LogFile, LineCarriesNumberTimeAndDate) {
     zkTempDir dir;
-    const std::string path = dir.file("app.log");
-    zkLogFile log(zkStringBase(path.c_str()), 0);
+    zkLogFile log(zkStringBase(dir.file("app.log").c_str()), 0);
     log.SetOption(zkLogFile::OptionEntryNumber, 1);
+    char before[32], after[32];
     int entries = 0;
-    std::string before;
-    do {  // again when the clock moved meanwhile
-        before = stamp();
-        ASSERT_TRUE(zkWriteFile(path, ""));
+    do {  // again when the clock moved meanwhile: local time as "HH:MM:SS MM/DD/YY"
+        std::time_t now = std::time(nullptr);
+        struct tm local;
+        std::strftime(before, sizeof before, "%H:%M:%S %m/%d/%y", localtime_r(&now, &local));
+        ASSERT_TRUE(zkWriteFile(dir.file("app.log"), ""));
         log.Log("Disk full", Level(1));
         ++entries;
-    } while (stamp() != before);
-    EXPECT_EQ(std::to_string(entries) + ") " + before + "  Disk full\n", zkReadFile(path));
+        now = std::time(nullptr);
+        std::strftime(after, sizeof after, "%H:%M:%S %m/%d/%y", localtime_r(&now, &local));
+    } while (std::string(before) != after);
+    EXPECT_EQ(std::to_string(entries) + ") " + before + "  Disk full\n", zkReadFile(dir.file("app.log")));
 }
 
 // Only entries at or below the log's level are written and numbered; the
@@ -85,9 +75,8 @@ TEST(LogFile, ClearDeletesTheFile) {
 // or not the file can be written.
 TEST(LogFile, MessagesAreWrittenVerbatim) {
     zkTempDir dir;
-    const std::string path = dir.file("m.log");
-    ASSERT_TRUE(zkWriteFile(path, "kept\n"));
-    zkLogFile log = plainLog(path);
+    ASSERT_TRUE(zkWriteFile(dir.file("m.log"), "kept\n"));
+    zkLogFile log = plainLog(dir.file("m.log"));
     testing::internal::CaptureStdout();
     log.UseDisplay();
     log.Log("filtered", Level(2));
@@ -101,76 +90,64 @@ TEST(LogFile, MessagesAreWrittenVerbatim) {
     log.UseDisplay();
     log.Log("lost", Level(1));
     EXPECT_EQ("50% %s %n\nlost\n", testing::internal::GetCapturedStdout());
-    EXPECT_EQ("kept\n50% %s %n\ncount -42\nname x\n v\nt \n\n", zkReadFile(path));
+    EXPECT_EQ("kept\n50% %s %n\ncount -42\nname x\n v\nt \n\n", zkReadFile(dir.file("m.log")));
 }
 
 TEST(LogFile, MakeTDNumPadsWithSignedComparisons) {
     zkLogFile log;
     zkStringBase out("old");
     // clang-format off
-    const struct {
-        long n;
-        unsigned three;
-        const char* text;
-    } rows[] = {
+    const struct { long n; unsigned three; const char* text; } rows[] = {
         {9, 0, "09"}, {10, 0, "10"}, {9, 1, "009"}, {10, 1, "010"}, {99, 1, "099"}, {100, 1, "100"},
         {1234, 1, "1234"}, {-5, 0, "0-5"}, {-5, 1, "00-5"}, {-42, 0, "0-42"},
     };
     // clang-format on
     for (const auto& row : rows) {
-        SCOPED_TRACE(row.text);
         log.MakeTDNum(out, row.n, row.three);
-        EXPECT_STREQ(row.text, out.data());
+        EXPECT_STREQ(row.text, out.data()) << row.n;
     }
 }
 
 // A write past the file size limit costs only the entries that did not fit.
 TEST(LogFile, FileSizeLimitKeepsTheEarlierEntries) {
     zkTempDir dir;
-    const std::string path = dir.file("limited.log");
-    zkLogFile log = plainLog(path);
+    zkLogFile log = plainLog(dir.file("limited.log"));
     log.Log("first", Level(1));
-    const std::string before = zkReadFile(path);
     for (unsigned room : {0u, 4u}) {
         SCOPED_TRACE(room);
-        ASSERT_TRUE(zkWithFileSizeLimit(before.size() + room, [&] { log.Log("refused entry", Level(1)); }));
-        const std::string after = zkReadFile(path);
-        EXPECT_LE(after.size(), before.size() + room);
-        EXPECT_EQ(before, after.substr(0, before.size()));
+        ASSERT_TRUE(zkWithFileSizeLimit(6 + room, [&] { log.Log("refused entry", Level(1)); }));
+        const std::string after = zkReadFile(dir.file("limited.log"));
+        EXPECT_LE(after.size(), 6 + room);
+        EXPECT_EQ("first\n", after.substr(0, 6));
     }
 }
 
 // Entries from several processes, each with several threads and one log
 // object per thread, all arrive whole and once.
 TEST(LogLoad, ProcessesAndThreadsWriteEveryEntryWholeOnce) {
-    constexpr int kProcesses = 3, kThreads = 3, kEntries = 500;
+    constexpr int kWriters = 2, kEntries = 500;  // per process, per thread
     zkTempDir dir;
-    const std::string path = dir.file("load.log");
-    const std::string padding(200, '.');  // so that a split or interleaved write would show
-    std::vector<std::string> expected;
-    for (int p = 0; p < kProcesses; ++p) {
-        for (int t = 0; t < kThreads; ++t)
-            for (int n = 0; n < kEntries; ++n) expected.push_back(std::to_string(p * 10000 + t * 1000 + n) + padding);
+    std::vector<std::string> expected, lines;
+    for (int n = 0; n < kWriters * kWriters * kEntries; ++n)
+        expected.push_back(std::to_string(n) + std::string(200, '.'));
+    for (int p = 0; p < kWriters; ++p) {
         const pid_t pid = fork();
         ASSERT_NE(-1, pid);
         if (pid != 0) continue;
         std::vector<std::thread> threads;
-        for (int t = 0; t < kThreads; ++t)
+        for (int t = p * kWriters; t < (p + 1) * kWriters; ++t)
             threads.emplace_back([&, t] {
-                zkLogFile log = plainLog(path);
-                for (int n = 0; n < kEntries; ++n)
-                    log.Log((std::to_string(p * 10000 + t * 1000 + n) + padding).c_str(), Level(1));
+                zkLogFile log = plainLog(dir.file("load.log"));
+                for (int n = t * kEntries; n < (t + 1) * kEntries; ++n) log.Log(expected[n].c_str(), Level(1));
             });
         for (std::thread& thread : threads) thread.join();
         _exit(0);
     }
-    for (int p = 0; p < kProcesses; ++p) {
-        int status = 0;
+    for (int p = 0, status = 0; p < kWriters; ++p) {
         ASSERT_NE(-1, wait(&status));
         EXPECT_EQ(0, status);
     }
-    std::vector<std::string> lines;
-    std::istringstream in(zkReadFile(path));
+    std::istringstream in(zkReadFile(dir.file("load.log")));
     for (std::string line; std::getline(in, line);) lines.push_back(line);
     std::sort(expected.begin(), expected.end());
     std::sort(lines.begin(), lines.end());

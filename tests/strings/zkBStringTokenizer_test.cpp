@@ -12,11 +12,7 @@
 TEST(Tokenizer, OneMoreTokenThanSeparators) {
     const std::string crlf = zkText(zkBStringTokenizer::m_crlfToken), comma = zkText(zkBStringTokenizer::m_csvToken);
     // clang-format off
-    const struct {
-        std::string source, seps;
-        bool strip;
-        std::vector<std::string> tokens;
-    } cases[] = {
+    const struct { std::string source, seps; bool strip; std::vector<std::string> tokens; } cases[] = {
         {"a,b,d", comma, false, {"a", "b", "d"}}, {"abc", comma, false, {"abc"}}, {"", comma, false, {}},
         {"", ",;", false, {}}, {"a,,b", comma, false, {"a", "", "b"}}, {",a", comma, false, {"", "a"}},
         {"a,", comma, false, {"a", ""}}, {"a;", ",;", false, {"a", ""}}, {",,,", comma, false, {"", "", "", ""}},

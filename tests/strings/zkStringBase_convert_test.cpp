@@ -9,11 +9,7 @@
 #include "support/zkStringText.h"
 #include "zkStringBase.h"
 
-namespace {
-
 using S = zkStringBase;
-
-}  // namespace
 
 // Texts up to and past the fixed buffer come out whole; the compare type stays.
 TEST(StringConvert, NumbersToText) {
@@ -34,11 +30,11 @@ TEST(StringConvert, NumbersToText) {
 // Decimal, as strtol and strtod read it: leading blanks and a sign allowed,
 // stopping at the first byte that does not fit.
 TEST(StringConvert, TextToNumbers) {
-    const struct {
-        const char* text;
-        long asLong;
-        double asDouble;
-    } rows[] = {{"10", 10, 10.0}, {" -907x", -907, -907.0}, {"0x1A", 0, 26.0}, {"2.5e1", 2, 25.0}, {"", 0, 0.0}};
+    // clang-format off
+    const struct { const char* text; long asLong; double asDouble; } rows[] = {
+        {"10", 10, 10.0}, {" -907x", -907, -907.0}, {"0x1A", 0, 26.0}, {"2.5e1", 2, 25.0}, {"", 0, 0.0},
+    };
+    // clang-format on
     for (const auto& row : rows) {
         SCOPED_TRACE(row.text);
         EXPECT_EQ(row.asLong, S(row.text).asLong());
@@ -46,52 +42,38 @@ TEST(StringConvert, TextToNumbers) {
     }
 }
 
-// isNumber accepts only whole decimal numbers.
+// isNumber accepts only whole decimal numbers: a sign, digits with at most one
+// point, an exponent, blanks only in front.
 TEST(StringConvert, IsNumberAcceptsWholeDecimalNumbers) {
-    for (const char* text : {"42", " -7", "\t 5", "3.", ".5", "1e5", "1E-3", "2e+", "1e-", "-1e-5", "+0.5e+10"}) {
-        SCOPED_TRACE(text);
-        EXPECT_TRUE(S(text).isNumber());
-    }
-    for (const char* text : {"",     " ",  ".",  "-",   "5 ",  "1.2.3", "1e5.2", "1e2e3", "e5",  "+-1", "1,5",
-                             "0x1F", "1e", "5-", "1-2", "-.5", "\n5",   "1e5+",  ". 5",   "1.e", "\xb5"}) {
-        SCOPED_TRACE(text);
-        EXPECT_FALSE(S(text).isNumber());
-    }
-    EXPECT_FALSE(S("12\0"
-                   "3",
-                   4)
-                     .isNumber());
-}
-
-TEST(StringText, SkipNextWhite) {
-    const struct {
-        const char* text;
-        unsigned pos, expected;
-    } rows[] = {{" \t\r\nx", 0, 4}, {"   ", 0, 3}, {"abc", 9, 9}, {"a b", 1, 2},
-                {"\vx", 0, 0},      {"\fx", 0, 0}, {"", 0, 0}};
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.text);
-        EXPECT_EQ(row.expected, S(row.text).skipNextWhite(row.pos));
-    }
-}
-
-TEST(StringText, StripWhite) {
     // clang-format off
-    const struct {
-        std::string text;
-        zkStringBase::StripType bits;
-        std::string expected;
-    } rows[] = {
+    const std::pair<std::string, bool> rows[] = {
+        {"42", true}, {" -7", true}, {"\t 5", true}, {"3.", true}, {".5", true}, {"1e5", true}, {"1E-3", true},
+        {"2e+", true}, {"1e-", true}, {"-1e-5", true}, {"+0.5e+10", true}, {"", false}, {" ", false}, {".", false},
+        {"-", false}, {"5 ", false}, {"1.2.3", false}, {"1e5.2", false}, {"1e2e3", false}, {"e5", false},
+        {"+-1", false}, {"1,5", false}, {"0x1F", false}, {"1e", false}, {"5-", false}, {"1-2", false},
+        {"-.5", false}, {"\n5", false}, {"1e5+", false}, {". 5", false}, {"1.e", false}, {"\xb5", false},
+        {{"12\0003", 4}, false},
+    };
+    // clang-format on
+    for (const auto& row : rows) EXPECT_EQ(row.second, zkStr(row.first).isNumber()) << '\'' << row.first << '\'';
+}
+
+// Whitespace is blank, tab and line ends for skipNextWhite, and also \v and
+// \f for stripWhite.
+TEST(StringText, WhitespaceRules) {
+    // clang-format off
+    const struct { const char* text; unsigned pos, expected; } skips[] = {
+        {" \t\r\nx", 0, 4}, {"   ", 0, 3}, {"abc", 9, 9}, {"a b", 1, 2}, {"\vx", 0, 0}, {"\fx", 0, 0}, {"", 0, 0},
+    };
+    const struct { std::string text; zkStringBase::StripType bits; std::string expected; } strips[] = {
         {"  a b  ", S::StripEnds, "a b"}, {"  a b  ", S::StripAll, "ab"}, {"   ", S::StripTrailing, ""},
         {"   ", S::StripLeading, ""}, {"a  ", S::StripLeading, "a  "}, {" a ", S::StripTrailing, " a"},
         {" \t\r\n\v\fa\v b\f", S::StripEnds, "a\v b"}, {"", S::StripEnds, ""},
         {" a\tb ", S::StripLeading | S::StripAll, "ab"}, {{" \0 ", 3}, S::StripEnds, {"\0", 1}},
     };
     // clang-format on
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.text);
-        EXPECT_EQ(row.expected, zkText(zkStr(row.text).stripWhite(row.bits)));
-    }
+    for (const auto& row : skips) EXPECT_EQ(row.expected, S(row.text).skipNextWhite(row.pos)) << row.text;
+    for (const auto& row : strips) EXPECT_EQ(row.expected, zkText(zkStr(row.text).stripWhite(row.bits))) << row.text;
 }
 
 // Case changes touch only letters, zero bytes included; every whitespace

@@ -1,4 +1,6 @@
-// Comparison, search and cutting of zkStringBase.
+// Comparison, search and cutting of zkStringBase. The folded find over long
+// strings skips ahead; it is checked against the same search over a short
+// string, which tries every position.
 #include <gtest/gtest.h>
 
 #include <string>
@@ -6,24 +8,16 @@
 #include "support/zkStringText.h"
 #include "zkStringBase.h"
 
-namespace {
-
 constexpr unsigned Bad = zkStringBase::BadIndex;
 constexpr auto kFolded = zkStringBase::CaseInsensitive;
 const char* const kNull = nullptr;
-
-}  // namespace
 
 // Exact: -1 or +1 at the first differing unsigned byte; folded: the
 // difference of the upper-cased bytes; on an equal prefix the shorter first.
 // The const char* forms read the text up to its first zero byte.
 TEST(StringCompare, NamedComparisons) {
     // clang-format off
-    const struct {
-        std::string a, b;
-        bool exact;
-        short order;
-    } rows[] = {
+    const struct { std::string a, b; bool exact; short order; } rows[] = {
         {"abc", "abd", true, -1}, {"abc", "ab", true, 1}, {"ab", "abc", true, -1}, {"abc", "abc", true, 0},
         {"abc", "ABC", true, 1}, {"\xff", "a", true, 1}, {{"ab\0", 3}, "ab", true, 1},
         {{"a\0b", 3}, {"a\0c", 3}, true, -1}, {"ABC", "abc", false, 0}, {"a", "e", false, -4}, {"e", "A", false, 4},
@@ -111,6 +105,36 @@ TEST(StringSearch, FindRfindAndFindFirstOfBoundaries) {
     for (const auto& row : found) EXPECT_EQ(row[1], row[0]) << "row " << &row - found;
 }
 
+// The same tail behind a long filler that holds no match: the long search
+// finds what the short one finds, shifted by the filler. Bytes from 0x80 up
+// fold only as the locale says (not at all by default), and a match may end
+// at the last byte.
+TEST(StringSearch, FoldedFindSkipsAheadWithoutMissingAMatch) {
+    const std::string filler(4096, '-');
+    const struct {
+        std::string tail;
+        std::string pattern;
+    } cases[] = {
+        {"abc xyzXYZ", "xYz"},
+        {"zz Hello\xC4\xE4 hello\xE4\xE4", "HELLO\xE4\xE4"},
+        {"aaaaaaaaab", "AAB"},
+        {"no match here", "MATCHES"},
+        {"\xE9t\xC9T\xE9T", "\xC9t"},
+        {"end", "END"},
+        {"ba", "AB"},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.tail);
+        const zkStringBase shortText = zkStr(c.tail), longText = zkStr(filler + c.tail), pattern = zkStr(c.pattern);
+        const unsigned expected = shortText.find(pattern, 0, false);
+        const unsigned shifted = expected == zkStringBase::BadIndex ? expected : expected + 4096u;
+        EXPECT_EQ(shifted, longText.find(pattern, 0, false));
+        EXPECT_EQ(shifted, longText.find(pattern, 100, false));
+    }
+    EXPECT_EQ(4096u + 3u, zkStr(filler + "zz Hello").find(zkStr("HELLO"), 0, false));
+    EXPECT_EQ(zkStringBase::BadIndex, zkStr(filler + "zz Hell").find(zkStr("HELLO"), 0, false));
+}
+
 // subString(from, to) makes a new case-sensitive string.
 TEST(StringCut, SubStringCopiesTheRange) {
     const zkStringBase hello = zkStr("hello", kFolded);
@@ -129,14 +153,8 @@ TEST(StringCut, SubStringCopiesTheRange) {
 // empties out.
 TEST(StringCut, FieldCutterStopsAtASeparator) {
     // clang-format off
-    const struct {
-        std::string source, seps;
-        unsigned from, to;
-        int clear;
-        const char* before;
-        unsigned result;
-        std::string after;
-    } cuts[] = {
+    const struct { std::string source, seps; unsigned from, to; int clear; const char* before; unsigned result;
+                   std::string after; } cuts[] = {
         {"a,bc", ",", 0, Bad, 0, "X", 1, "Xa"},    {"a,bc", ",", 2, Bad, 0, "", Bad, "bc"},
         {"a,bc", ",", 2, Bad, 1, "k", Bad, ""},    {"a,bc", ",", 1, Bad, 1, "k", 1, "k"},
         {"a,bc", ",", 0, 0, 0, "", Bad, "a"},      {"a,bc", ",", 4, Bad, 0, "k", Bad, "k"},

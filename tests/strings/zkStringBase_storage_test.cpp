@@ -9,8 +9,6 @@
 #include "support/zkStringText.h"
 #include "zkStringBase.h"
 
-namespace {
-
 constexpr unsigned kSlack = 128;
 using Op = void (*)(zkStringBase&);
 using S = zkStringBase;
@@ -25,15 +23,9 @@ struct CountingString : zkStringBase {
     unsigned calls = 0;
 };
 
-}  // namespace
-
 TEST(StringConstruction, CapacityIsTheTextAndTheSlack) {
     // clang-format off
-    const struct {
-        zkStringBase s;
-        std::string text;
-        unsigned capacity;
-    } cases[] = {
+    const struct { zkStringBase s; std::string text; unsigned capacity; } cases[] = {
         {S(), "", kSlack}, {S("abc"), "abc", 3 + kSlack}, {S("abc", 0), "", kSlack}, {S(nullptr), "", kSlack},
         {S(nullptr, 5), "", kSlack}, {S("a\0b", 3), {"a\0b", 3}, 3 + kSlack}, {S(16u), "", 16}, {S(0u), "", 1},
     };
@@ -74,15 +66,6 @@ TEST(StringConstruction, CopiesKeepCapacityAndCompareType) {
     EXPECT_EQ(zkStringBase::CaseInsensitive, joined.getCompareType());
 }
 
-TEST(StringGrowth, OneGrowthAtThe128thCharacterThroughResize) {
-    CountingString s;
-    for (int i = 0; i < 127; ++i) s.append('x');
-    EXPECT_EQ(0u, s.calls);
-    s.append('x');
-    EXPECT_EQ(1u, s.calls);
-    EXPECT_EQ(129u + kSlack, s.capacity());
-}
-
 // Each edit starts from `start`, reserved to `room` bytes unless that is 0;
 // a growth adds the slack to what is needed and goes through resize(), and
 // nothing else reallocates.
@@ -90,13 +73,9 @@ TEST(StringGrowth, EditsGrowByTheRule) {
     const unsigned big = static_cast<unsigned>(std::to_string(1e300).size());
     const unsigned longMin = static_cast<unsigned>(std::to_string(LONG_MIN).size());
     // clang-format off
-    const struct {
-        const char* start;
-        unsigned room;
-        Op op;
-        std::string text;
-        unsigned capacity, resizes;
-    } cases[] = {
+    const struct { const char* start; unsigned room; Op op; std::string text; unsigned capacity, resizes; } cases[] = {
+        {"", 0, [](S& s) { for (int i = 0; i < 127; ++i) s.append('x'); }, std::string(127, 'x'), kSlack, 0},
+        {"", 0, [](S& s) { for (int i = 0; i < 128; ++i) s.append('x'); }, std::string(128, 'x'), 129 + kSlack, 1},
         {"", 4, [](S& s) { s = "abc"; }, "abc", 4, 0},
         {"", 4, [](S& s) { s = "abcd"; }, "abcd", 4 + kSlack, 1},
         {"", 2, [](S& s) { s = 'x'; }, "x", 2, 0},
@@ -132,11 +111,7 @@ TEST(StringGrowth, EditsGrowByTheRule) {
 // Ranges are clamped to the text; a null or empty source adds nothing.
 TEST(StringEditing, EditsClampTheirRanges) {
     // clang-format off
-    const struct {
-        const char* start;
-        Op op;
-        std::string text;
-    } cases[] = {
+    const struct { const char* start; Op op; std::string text; } cases[] = {
         {"x", [](S& s) { s.append("", 0).append(nullptr, 5).prepend(nullptr).insert(nullptr, 0); }, "x"},
         {"x", [](S& s) { s.append("ab", 1).append("cd\0e", 0).append(S("\0z", 2)).append('\0'); }, {"xacd\0z\0", 7}},
         {"cd", [](S& s) { s.prepend("ab").prepend('>').prepend(S("\0", 1)); }, {"\0>abcd", 6}},
@@ -162,16 +137,15 @@ TEST(StringEditing, EditsClampTheirRanges) {
     }
 }
 
+// Also when the source lies in the string's own buffer.
 TEST(StringLimits, LengthPastThirtyTwoBitsThrowsAndKeepsText) {
+    // clang-format off
     const Op ops[] = {
-        [](S& s) { s.append("y", 0xFFFFFFFFu); },
-        [](S& s) { s.append("y", 0xFFFFFFFDu); },
-        [](S& s) { s.prepend("y", 0xFFFFFFFEu); },
-        [](S& s) { s.insert("y", 1, 0xFFFFFFFDu); },
-        // Also when the source lies in the string's own buffer.
-        [](S& s) { s.append(s.data(), 0xFFFFFFFFu); },
-        [](S& s) { s.insert(s.data(), 1, 0xFFFFFFFEu); },
+        [](S& s) { s.append("y", 0xFFFFFFFFu); }, [](S& s) { s.append("y", 0xFFFFFFFDu); },
+        [](S& s) { s.prepend("y", 0xFFFFFFFEu); }, [](S& s) { s.insert("y", 1, 0xFFFFFFFDu); },
+        [](S& s) { s.append(s.data(), 0xFFFFFFFFu); }, [](S& s) { s.insert(s.data(), 1, 0xFFFFFFFEu); },
     };
+    // clang-format on
     for (Op op : ops) {
         SCOPED_TRACE(&op - ops);
         zkStringBase s("xz");

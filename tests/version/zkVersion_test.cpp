@@ -1,4 +1,5 @@
-// Parsing and ordering versions with zkVersionDescriptor.
+// Parsing and ordering versions with zkVersionDescriptor; the library's own
+// version.
 #include <gtest/gtest.h>
 
 #include <climits>
@@ -7,25 +8,17 @@
 #include <vector>
 
 #include "zkVersionDescriptor.h"
+#include "zkutilVersion.h"
 
-namespace {
-
-struct Fields {
-    int major, minor;
-    char subMinor;
-};
-
-void expectFields(const Fields& expected, const zkVersionDescriptor& v) {
-    EXPECT_EQ(expected.major, v.GetMajor());
-    EXPECT_EQ(expected.minor, v.GetMinor());
-    EXPECT_EQ(expected.subMinor, v.GetSubMinor());
+static void expectFields(int major, int minor, char subMinor, const zkVersionDescriptor& v) {
+    EXPECT_EQ(major, v.GetMajor());
+    EXPECT_EQ(minor, v.GetMinor());
+    EXPECT_EQ(subMinor, v.GetSubMinor());
 }
 
-}  // namespace
-
 TEST(VersionDescriptor, StartsAtZero) {
-    expectFields({0, 0, 0}, zkVersionDescriptor());
-    expectFields({0, 0, 0}, zkVersionDescriptor(nullptr));
+    expectFields(0, 0, 0, zkVersionDescriptor());
+    expectFields(0, 0, 0, zkVersionDescriptor(".5"));
 }
 
 // Text of any length, with or without a full stop, numbers clamped to 32 bits,
@@ -33,11 +26,7 @@ TEST(VersionDescriptor, StartsAtZero) {
 // is caught. Unparsable text leaves the version alone.
 TEST(VersionDescriptor, ParsesText) {
     // clang-format off
-    const struct {
-        const char* text;
-        int major, minor;
-        char subMinor;
-    } rows[] = {
+    const struct { const char* text; int major, minor; char subMinor; } rows[] = {
         {"1.10a", 1, 10, '0'}, {"2.1a", 2, 1, 'a'}, {"1.2.3", 1, 2, '.'}, {"1.-2", 1, 0, '2'}, {"", 9, 9, 0},
         {nullptr, 9, 9, 0}, {"2.", 2, 0, 0}, {".5", 9, 9, 0}, {"5", 5, 0, 0}, {"1234.5678z", 1234, 5678, 'z'},
         {"1.9999999999", 1, INT_MAX, '9'}, {"-9999999999.1", INT_MIN, 1, 0}, {"9999999999", INT_MAX, 0, 0},
@@ -48,7 +37,7 @@ TEST(VersionDescriptor, ParsesText) {
         const std::vector<char> text(row.text, row.text + (row.text ? std::strlen(row.text) + 1 : 0));
         zkVersionDescriptor v("9.9");
         EXPECT_EQ(0, v.SetVersionDescriptor(row.text ? text.data() : nullptr));
-        expectFields({row.major, row.minor, row.subMinor}, v);
+        expectFields(row.major, row.minor, row.subMinor, v);
     }
 }
 
@@ -66,4 +55,13 @@ TEST(VersionDescriptor, Ordering) {
             EXPECT_EQ(i == j, a == b);
             EXPECT_EQ(line[i] == line[j], a.IsInline(b));
         }
+}
+
+// The library reports the version its headers were generated with, and the
+// string is the three numbers joined by full stops.
+TEST(LibraryVersion, RunTimeMatchesHeader) {
+    const std::string joined = std::to_string(ZKUTIL_VERSION_MAJOR) + "." + std::to_string(ZKUTIL_VERSION_MINOR) + "." +
+                               std::to_string(ZKUTIL_VERSION_PATCH);
+    EXPECT_EQ(joined, ZKUTIL_VERSION);
+    EXPECT_STREQ(ZKUTIL_VERSION, zkutilVersion());
 }
