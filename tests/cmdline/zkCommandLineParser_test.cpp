@@ -28,8 +28,9 @@ TEST(CommandLineString, SwitchesBecomeEntries) {
     const struct { const char* command; char switchChar, separator; std::initializer_list<const char*> names;
                    const char* values; } cases[] = {
         {"prog -in:data.ini -out:\"my file.ini\"", '-', ':', {"in", "out", "prog"}, "data.ini|my file.ini|<none>"},
-        {"-n: 5 -n:6 -a:1-b:2", '-', ':', {"n", "a", "b"}, "6|1-b:2|<none>"},
-        {"-v -x:1 -a:\"\" -b:\"x y", '-', ':', {"v -x", "x", "a", "b"}, "1|<none>||x y"},
+        {"-n: 5 -n:6 x -a:1-b:2", '-', ':', {"n", "a", "b"}, "6|1-b:2|<none>"},
+        {"-v -x:1 -a:\"\" w -b:\"x y", '-', ':', {"v -x", "x", "a", "b"}, "1|<none>||x y"},
+        {"-:x -b:2", '-', ':', {"b", ":x -b", ""}, "2|<none>|<none>"},
         {"-:x \"y\" z -a:", '-', ':', {"", "x", "y", "z", "a"}, "<none>|<none>|<none>|<none>|<none>"},
         {"  -p:   ab  -q:\" a b \" -r:ab\t -s:\t\r\nab", '-', ':', {"p", "q", "r", "s"}, "ab| a b |ab|ab"},
         {"-p:a\tb -q:a\"b -r", '-', ':', {"p", "q", "r"}, "a\tb|a\"b|<none>"},
@@ -48,15 +49,17 @@ TEST(CommandLineString, SwitchesBecomeEntries) {
 
 // argv[0] is skipped; without a separator the first character names the switch.
 TEST(CommandLineVector, EachElementIsOneSwitch) {
-    char* argv[] = {arg("-ignored:1"), arg("-in:data.ini"), arg("-out:a:b"), arg("-o:"),
-                    arg("-level"),     arg("-:x"),          arg("-"),        arg("file.ini"),
-                    arg("-in:other"),  arg("/path=out")};
-    zkCommandLineParser p(10, argv);
+    // clang-format off
+    char* argv[] = {arg("-ignored:1"), arg("-in:data.ini"), arg("-out:a:b"), arg("-o:"), arg("-level"), arg("-:x"),
+                    arg("-"), nullptr, arg(""), arg("file.ini"), arg("-in:other"), arg("/path=out"), arg("-z:past")};
+    // clang-format on
+    zkCommandLineParser p(12, argv);
     EXPECT_EQ(1, p.ParseCommand());
-    EXPECT_EQ("other|a:b|||x|<none>|<none>", entries(p, {"in", "out", "o", "l", "", "ignored", "file.ini"}));
+    EXPECT_EQ("other|a:b|||x|<none>|<none>|<none>",
+              entries(p, {"in", "out", "o", "l", "", "ignored", "file.ini", "z"}));
     EXPECT_EQ(1, p.SetCommand(zkStringBase("-s:1")));
     EXPECT_EQ("1|other", entries(p, {"s", "in"}));
-    zkCommandLineParser slash(10, argv, '/', '=');
+    zkCommandLineParser slash(12, argv, '/', '=');
     EXPECT_EQ(1, slash.ParseArgcArgv());
     EXPECT_EQ("out|<none>", entries(slash, {"path", "in"}));
 }
@@ -66,9 +69,12 @@ TEST(CommandLineVector, EachElementIsOneSwitch) {
 // ParseCommand then parses the emptied string.
 TEST(CommandLineParser, ValidateGivesTheResult) {
     char* argv[] = {arg("prog"), arg("-in:data.ini")};
+    zkCommandLineParser fresh;
+    EXPECT_EQ(0, fresh.IsValid());
     Refusing r(zkStringBase("-a:1 -b:0"));
     EXPECT_EQ(0, r.ParseCommand());
     EXPECT_EQ(0, r.SetCommand(zkStringBase("-b:2")));
+    EXPECT_EQ(0, r.IsValid());
     EXPECT_EQ(0, r.SetCommand(2, argv));
     EXPECT_EQ("1|2|data.ini", entries(r, {"a", "b", "in"}));
     r.SetValue("b", zkStringBase("set"));
@@ -95,4 +101,8 @@ TEST(CommandLineParser, CaseInsensitiveLookupFindsCapitals) {
         EXPECT_EQ(1, p.GetValue(name, out));
         EXPECT_EQ(std::to_string(i), out.data());
     }
+    zkStringBase folded("v");  // a value keeps its compare type
+    folded.setCompareType(zkStringBase::CaseInsensitive);
+    p.SetValue("folded", folded);
+    EXPECT_EQ(zkStringBase::CaseInsensitive, p.GetValue("folded").getCompareType());
 }

@@ -34,11 +34,32 @@ TEST(LogFile, LineCarriesNumberTimeAndDate) {
         std::strftime(before, sizeof before, "%H:%M:%S %m/%d/%y", localtime_r(&now, &local));
         ASSERT_TRUE(zkWriteFile(dir.file("app.log"), ""));
         log.Log("Disk full", Level(1));
-        ++entries;
+        log.Log("Disk full", Level(1));
+        entries += 2;
         now = std::time(nullptr);
         std::strftime(after, sizeof after, "%H:%M:%S %m/%d/%y", localtime_r(&now, &local));
     } while (std::string(before) != after);
-    EXPECT_EQ(std::to_string(entries) + ") " + before + "  Disk full\n", zkReadFile(dir.file("app.log")));
+    const std::string line = ") " + std::string(before) + "  Disk full\n";
+    EXPECT_EQ(std::to_string(entries - 1) + line + std::to_string(entries) + line, zkReadFile(dir.file("app.log")));
+}
+
+// The time stamp is on and the rest off by default; a new file name, or
+// SetDefaults, turns the reserved word back to 0.
+TEST(LogFile, OptionDefaults) {
+    zkLogFile log;
+    const unsigned defaults[] = {0, 1, 0};
+    for (unsigned option = 0; option < 3; ++option) {
+        SCOPED_TRACE(option);
+        EXPECT_EQ(defaults[option], log.GetOption(zkLogFile::LogOption(option)));
+        log.SetOption(zkLogFile::LogOption(option), 7);
+        EXPECT_EQ(7u, log.GetOption(zkLogFile::LogOption(option)));
+    }
+    log.SetFilename("other.log", 0);
+    EXPECT_EQ(0u, log.GetOption(zkLogFile::OptionReserved));
+    EXPECT_EQ(7u, log.GetOption(zkLogFile::OptionTimeStamp));
+    log.SetDefaults();
+    for (unsigned option = 0; option < 3; ++option)
+        EXPECT_EQ(defaults[option], log.GetOption(zkLogFile::LogOption(option)));
 }
 
 // Only entries at or below the log's level are written and numbered; the

@@ -27,7 +27,7 @@ TEST(VersionDescriptor, StartsAtZero) {
 TEST(VersionDescriptor, ParsesText) {
     // clang-format off
     const struct { const char* text; int major, minor; char subMinor; } rows[] = {
-        {"1.10a", 1, 10, '0'}, {"2.1a", 2, 1, 'a'}, {"1.2.3", 1, 2, '.'}, {"1.-2", 1, 0, '2'}, {"", 9, 9, 0},
+        {"1.10a", 1, 10, '0'}, {"1.05", 1, 5, '5'}, {"2.1a", 2, 1, 'a'}, {"1.2.3", 1, 2, '.'}, {"1.-2", 1, 0, '2'}, {"", 9, 9, 0},
         {nullptr, 9, 9, 0}, {"2.", 2, 0, 0}, {".5", 9, 9, 0}, {"5", 5, 0, 0}, {"1234.5678z", 1234, 5678, 'z'},
         {"1.9999999999", 1, INT_MAX, '9'}, {"-9999999999.1", INT_MIN, 1, 0}, {"9999999999", INT_MAX, 0, 0},
     };
