@@ -69,8 +69,8 @@ TEST(CommandLineVector, EachElementIsOneSwitch) {
 // ParseCommand then parses the emptied string.
 TEST(CommandLineParser, ValidateGivesTheResult) {
     char* argv[] = {arg("prog"), arg("-in:data.ini")};
-    zkCommandLineParser fresh;
-    EXPECT_EQ(0, fresh.IsValid());
+    zkCommandLineParser fresh, byString(zkStringBase("-a:1")), byVector(2, argv);
+    for (zkCommandLineParser* unparsed : {&fresh, &byString, &byVector}) EXPECT_EQ(0, unparsed->IsValid());
     Refusing r(zkStringBase("-a:1 -b:0"));
     EXPECT_EQ(0, r.ParseCommand());
     EXPECT_EQ(0, r.SetCommand(zkStringBase("-b:2")));

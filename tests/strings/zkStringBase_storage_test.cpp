@@ -108,6 +108,20 @@ TEST(StringGrowth, EditsGrowByTheRule) {
     }
 }
 
+// With no slack every buffer still has room for the terminator.
+TEST(StringGrowth, ZeroSlackLeavesRoomForTheTerminator) {
+    const unsigned saved = zkStringBase::_sGrowLength;
+    zkStringBase::_sGrowLength = 0;
+    zkStringBase empty, abc("abc"), appended("ab"), assigned;
+    appended.append("cd");
+    assigned = "abcdefgh";
+    zkStringBase::_sGrowLength = saved;
+    EXPECT_EQ(1u, empty.capacity());
+    EXPECT_EQ(4u, abc.capacity());
+    EXPECT_EQ(5u, appended.capacity());
+    EXPECT_EQ(9u, assigned.capacity());
+}
+
 // Ranges are clamped to the text; a null or empty source adds nothing.
 TEST(StringEditing, EditsClampTheirRanges) {
     // clang-format off
