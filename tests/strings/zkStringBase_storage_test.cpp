@@ -23,11 +23,24 @@ struct CountingString : zkStringBase {
     unsigned calls = 0;
 };
 
+// A copy keeps the capacity, leaving room for the terminator when an adopted
+// buffer recorded its length as its capacity; concatenate copies the first
+// string and stops the second at a zero byte.
 TEST(StringConstruction, CapacityIsTheTextAndTheSlack) {
+    zkStringBase wide("abcd");
+    wide.reserve(40);
+    char* tight = new char[4];
+    std::strcpy(tight, "abc");
+    zkStringBase adopted(tight, 0, 99), zero(0u);
+    EXPECT_EQ(tight, adopted.data());
+    EXPECT_EQ(3u, adopted.capacity());
+    zero.append("ab");
     // clang-format off
     const struct { zkStringBase s; std::string text; unsigned capacity; } cases[] = {
         {S(), "", kSlack}, {S("abc"), "abc", 3 + kSlack}, {S("abc", 0), "", kSlack}, {S(nullptr), "", kSlack},
         {S(nullptr, 5), "", kSlack}, {S("a\0b", 3), {"a\0b", 3}, 3 + kSlack}, {S(16u), "", 16}, {S(0u), "", 1},
+        {zero, "ab", 3 + kSlack}, {S(adopted), "abc", 4}, {S(wide), "abcd", 40},
+        {S::concatenate(wide, S("ef\0g", 4)), "abcdef", 40},
     };
     // clang-format on
     for (const auto& c : cases) {
@@ -35,35 +48,19 @@ TEST(StringConstruction, CapacityIsTheTextAndTheSlack) {
         EXPECT_EQ(c.text, zkText(c.s));
         EXPECT_EQ(c.capacity, c.s.capacity());
     }
-    zkStringBase zero(0u);
-    EXPECT_EQ("ab", zkText(zero.append("ab")));
 }
 
-// An adopted buffer of capacity 0 records its length as its capacity.
-TEST(StringConstruction, AdoptedBufferIsUsedInPlace) {
-    char* tight = new char[4];
-    std::strcpy(tight, "abc");
-    zkStringBase exact(tight, 0, 99);
-    EXPECT_EQ(tight, exact.data());
-    EXPECT_EQ(3u, exact.capacity());
-    EXPECT_EQ("abc", zkText(S(exact)));
-}
-
-// A copy keeps the capacity and compare type, an assigned text the compare
-// type; concatenate copies the first string and stops the second at a zero byte.
-TEST(StringConstruction, CopiesKeepCapacityAndCompareType) {
+// Copies and assigned strings keep the compare type; an assigned text keeps
+// the target's.
+TEST(StringConstruction, CopiesKeepTheCompareType) {
     zkStringBase src("Abc"), dst;
     src.setCompareType(zkStringBase::CaseInsensitive);
-    src.reserve(40);
     src = "abcd";
     dst = src;
-    const zkStringBase copy(src), joined = zkStringBase::concatenate(src, S("ef\0g", 4));
-    EXPECT_EQ("abcdef", zkText(joined));
-    EXPECT_EQ(40u, copy.capacity());
-    EXPECT_EQ(40u, joined.capacity());
-    EXPECT_EQ(zkStringBase::CaseInsensitive, copy.getCompareType());
+    EXPECT_EQ(zkStringBase::CaseInsensitive, src.getCompareType());
     EXPECT_EQ(zkStringBase::CaseInsensitive, dst.getCompareType());
-    EXPECT_EQ(zkStringBase::CaseInsensitive, joined.getCompareType());
+    EXPECT_EQ(zkStringBase::CaseInsensitive, S(src).getCompareType());
+    EXPECT_EQ(zkStringBase::CaseInsensitive, S::concatenate(src, dst).getCompareType());
 }
 
 // Each edit starts from `start`, reserved to `room` bytes unless that is 0;
