@@ -1,6 +1,7 @@
 // zkLogFile: the line format, levels, numbering, echo, clearing, failing
 // writes and concurrent writers.
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -83,6 +84,9 @@ TEST(LogFile, ClearDeletesTheFile) {
     EXPECT_NE(0, access(dir.file("old.log").c_str(), F_OK));
     log.SetFilename(dir.file("new.log").c_str(), 1);
     EXPECT_NE(0, access(dir.file("new.log").c_str(), F_OK));
+    ASSERT_EQ(0, mkdir(dir.file("folder").c_str(), 0700));  // files only
+    log.SetFilename(dir.file("folder").c_str(), 1);
+    EXPECT_EQ(0, access(dir.file("folder").c_str(), F_OK));
 }
 
 // The echo goes to standard output for the next written entry only, whether

@@ -78,7 +78,7 @@ TEST(StringSearch, FindRfindAndFindFirstOfBoundaries) {
         {s.rfind("abxab", Bad, 0, true), 0}, {s.rfind("abxabc", Bad, 0, true), Bad}, {s.rfind("", Bad, 0, true), Bad},
         {s.rfind('b'), 4}, {s.rfind('a', 2), 0}, {s.rfind('b', 0), Bad}, {s.rfind('a', 5), Bad},
         {s.rfind('A', Bad, false), 3}, {empty.rfind('a'), Bad}, {empty.rfind("a", Bad, 0, true), Bad},
-        {line.findFirstOf("\r\n", 0, 0, true), 2}, {line.findFirstOf("\n", 3, 0, true), 3},
+        {line.findFirstOf("\r\n", 0, 0, true), 2}, {line.findFirstOf("\n\r", 0, 0, true), 2}, {line.findFirstOf("\n", 3, 0, true), 3},
         {line.findFirstOf("\r\n", 4, 0, true), Bad}, {line.findFirstOf("", 0, 0, true), Bad},
         {line.findFirstOf("XB", 0, 0, false), 1}, {line.findFirstOf("X\n", 2, 0, false), 3},
         {line.findFirstOf("XB\n", 0, 0, true), 3}, {zkStr("ab\n").findFirstOf("\r\n", 0, 1, true), Bad},
