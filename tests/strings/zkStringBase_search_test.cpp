@@ -77,7 +77,7 @@ TEST(StringSearch, FindRfindAndFindFirstOfBoundaries) {
         {s.rfind("AB", Bad, 0, false), 3}, {s.rfind("AB", Bad, 0, true), Bad}, {s.rfind("xz", Bad, 1, true), 2},
         {s.rfind("abxab", Bad, 0, true), 0}, {s.rfind("abxabc", Bad, 0, true), Bad}, {s.rfind("", Bad, 0, true), Bad},
         {s.rfind('b'), 4}, {s.rfind('a', 2), 0}, {s.rfind('b', 0), Bad}, {s.rfind('a', 5), Bad},
-        {s.rfind('A', Bad, false), 3}, {empty.rfind('a'), Bad}, {empty.rfind("a", Bad, 0, true), Bad},
+        {s.rfind('A', Bad, false), 3}, {s.rfind('Z', Bad, false), Bad}, {s.rfind("ABX", Bad, 0, false), 0}, {empty.rfind('a'), Bad}, {empty.rfind("a", Bad, 0, true), Bad},
         {line.findFirstOf("\r\n", 0, 0, true), 2}, {line.findFirstOf("\n\r", 0, 0, true), 2}, {line.findFirstOf("\n", 3, 0, true), 3},
         {line.findFirstOf("\r\n", 4, 0, true), Bad}, {line.findFirstOf("", 0, 0, true), Bad},
         {line.findFirstOf("XB", 0, 0, false), 1}, {line.findFirstOf("X\n", 2, 0, false), 3},
@@ -138,7 +138,7 @@ TEST(StringCut, FieldCutterStopsAtASeparator) {
         {"a,bc", ",", Bad, Bad, 0, "k", Bad, "k"}, {"a,bc", ",", 3, 2, 2, "k", Bad, ""},
         {"", ",", 0, Bad, 1, "k", Bad, ""},        {"x,,yz", ",", 3, 99, 0, "", Bad, "yz"},
         {"a;b,c", ",;", 2, Bad, 0, "=", 3, "=b"},  {"a;b,c", ",;", 4, Bad, 0, "", Bad, "c"},
-        {"a;b,c", ",;", 1, 1, 1, "", 1, ""},       {"a;b,c", ",;", 2, 2, 0, "", Bad, "b"},
+        {"a;b,c", ",;", 1, 1, 1, "", 1, ""},       {"a;b,c", ",;", 2, 2, 0, "", Bad, "b"},   {"a;b,c", ",;=", 2, 2, 0, "", Bad, "b"},
         {"a;b", "", 0, Bad, 0, "", Bad, "a;b"},    {{"a\0b", 3}, {"\0", 1}, 0, Bad, 0, "", 1, "a"},
     };
     // clang-format on

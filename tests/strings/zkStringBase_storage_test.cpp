@@ -90,6 +90,7 @@ TEST(StringGrowth, EditsGrowByTheRule) {
         // Below length + 1 a request is clamped, never losing text.
         {"abc", 8, [](S& s) { s.reserve(2); }, "abc", 4, 1},
         {"abc", 8, [](S& s) { s.resize(0); }, "abc", 4, 1},
+        {"abc", 8, [](S& s) { s.resize(3); }, "abc", 4, 1},
         {"abc", 0, [](S& s) { s.cut(10); }, "", 3 + kSlack, 0},
     };
     // clang-format on

@@ -39,6 +39,8 @@ TEST(VersionDescriptor, ParsesText) {
         EXPECT_EQ(0, v.SetVersionDescriptor(row.text ? text.data() : nullptr));
         expectFields(row.major, row.minor, row.subMinor, v);
     }
+    const char shifted[] = "95";  // the byte before the text is never read
+    expectFields(5, 0, 0, zkVersionDescriptor(shifted + 1));
 }
 
 // Major, then minor, then the sub-minor as a signed byte: a byte of 0x80 or
