@@ -23,7 +23,7 @@ static zkLogFile plainLog(const std::string& path) {
     return log;
 }
 
-TEST(LogFile, LineCarriesNumberTimeAndDate) {
+TEST(LogFile, LineFormat) {
     zkTempDir dir;
     zkLogFile log(zkStringBase(dir.file("app.log").c_str()), 0);
     log.SetOption(zkLogFile::OptionEntryNumber, 1);
@@ -142,7 +142,7 @@ TEST(LogFile, FileSizeLimitKeepsTheEarlierEntries) {
 
 // Entries from several processes, each with several threads and one log
 // object per thread, all arrive whole and once.
-TEST(LogLoad, ProcessesAndThreadsWriteEveryEntryWholeOnce) {
+TEST(LogLoad, EveryConcurrentEntryArrivesWholeOnce) {
     constexpr int kWriters = 2, kEntries = 500;  // per process, per thread
     zkTempDir dir;
     std::vector<std::string> expected, lines;

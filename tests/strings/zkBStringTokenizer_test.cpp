@@ -36,7 +36,7 @@ TEST(Tokenizer, OneMoreTokenThanSeparators) {
 
 // The source and the separators are read at each call; false leaves the
 // token alone. A source cut below the position gives one empty token more.
-TEST(Tokenizer, SourceAndSeparatorsAreReadAtEachCall) {
+TEST(Tokenizer, InputsAreReadAtEachCall) {
     zkStringBase source("a,b;c;d"), seps(","), token;
     zkBStringTokenizer tok(source, seps, false);
     EXPECT_TRUE(tok.GetNext(token));

@@ -63,7 +63,7 @@ TEST(StringCompare, OperatorsFollowTheCompareType) {
     for (const bool& fact : truths) EXPECT_TRUE(fact) << "fact " << &fact - truths;
 }
 
-TEST(StringSearch, FindRfindAndFindFirstOfBoundaries) {
+TEST(StringSearch, SearchesStopAtTheirBounds) {
     const zkStringBase hello("hello"), s("abxab"), line("ab\r\n"), empty;
     // clang-format off
     const unsigned found[][2] = {

@@ -150,7 +150,7 @@ TEST(StringEditing, EditsClampTheirRanges) {
 }
 
 // Also when the source lies in the string's own buffer.
-TEST(StringLimits, LengthPastThirtyTwoBitsThrowsAndKeepsText) {
+TEST(StringLimits, LengthPastThirtyTwoBitsThrowsWithTheTextKept) {
     // clang-format off
     const Op ops[] = {
         [](S& s) { s.append("y", 0xFFFFFFFFu); }, [](S& s) { s.append("y", 0xFFFFFFFDu); },
