@@ -1,0 +1,69 @@
+// Parsing and ordering versions with zkVersionDescriptor; the library's own
+// version.
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "zkVersionDescriptor.h"
+#include "zkutilVersion.h"
+
+static void expectFields(int major, int minor, char subMinor, const zkVersionDescriptor& v) {
+    EXPECT_EQ(major, v.GetMajor());
+    EXPECT_EQ(minor, v.GetMinor());
+    EXPECT_EQ(subMinor, v.GetSubMinor());
+}
+
+TEST(VersionDescriptor, StartsAtZero) {
+    expectFields(0, 0, 0, zkVersionDescriptor());
+    expectFields(0, 0, 0, zkVersionDescriptor(".5"));
+}
+
+// Text of any length, with or without a full stop, numbers clamped to 32 bits,
+// each read from a heap buffer of its exact size so that a read past the end
+// is caught. Unparsable text leaves the version alone.
+TEST(VersionDescriptor, ParsesText) {
+    // clang-format off
+    const struct { const char* text; int major, minor; char subMinor; } rows[] = {
+        {"1.10a", 1, 10, '0'}, {"1.05", 1, 5, '5'}, {"2.1a", 2, 1, 'a'}, {"1.2.3", 1, 2, '.'}, {"1.-2", 1, 0, '2'}, {"", 9, 9, 0},
+        {nullptr, 9, 9, 0}, {"2.", 2, 0, 0}, {".5", 9, 9, 0}, {"5", 5, 0, 0}, {"1234.5678z", 1234, 5678, 'z'},
+        {"1.9999999999", 1, INT_MAX, '9'}, {"-9999999999.1", INT_MIN, 1, 0}, {"9999999999", INT_MAX, 0, 0},
+    };
+    // clang-format on
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.text ? row.text : "null");
+        const std::vector<char> text(row.text, row.text + (row.text ? std::strlen(row.text) + 1 : 0));
+        zkVersionDescriptor v("9.9");
+        EXPECT_EQ(0, v.SetVersionDescriptor(row.text ? text.data() : nullptr));
+        expectFields(row.major, row.minor, row.subMinor, v);
+    }
+    const char shifted[] = "95";  // the byte before the text is never read
+    expectFields(5, 0, 0, zkVersionDescriptor(shifted + 1));
+}
+
+// Major, then minor, then the sub-minor as a signed byte: a byte of 0x80 or
+// more comes before no sub-minor. Versions sharing major and minor are in line.
+TEST(VersionDescriptor, Ordering) {
+    const char* ascending[] = {"-1.0", "0.0", "1.2\x80", "1.2", "3.1", "3.1a", "3.1b", "3.2", "10.0"};
+    const int line[] = {0, 1, 2, 2, 3, 3, 3, 4, 5};
+    for (int i = 0; i < 9; ++i)
+        for (int j = 0; j < 9; ++j) {
+            SCOPED_TRACE(std::string(ascending[i]) + " vs " + ascending[j]);
+            const zkVersionDescriptor a(ascending[i]), b(ascending[j]);
+            EXPECT_EQ(i < j, a < b);
+            EXPECT_EQ(i > j, a > b);
+            EXPECT_EQ(i == j, a == b);
+            EXPECT_EQ(line[i] == line[j], a.IsInline(b));
+        }
+}
+
+// The library reports the version its headers were generated with, and the
+// string is the three numbers joined by full stops.
+TEST(LibraryVersion, RunTimeMatchesHeader) {
+    const std::string joined = std::to_string(ZKUTIL_VERSION_MAJOR) + "." + std::to_string(ZKUTIL_VERSION_MINOR) + "." +
+                               std::to_string(ZKUTIL_VERSION_PATCH);
+    EXPECT_EQ(joined, ZKUTIL_VERSION);
+    EXPECT_STREQ(ZKUTIL_VERSION, zkutilVersion());
+}
