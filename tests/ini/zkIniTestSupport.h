@@ -7,16 +7,9 @@
 
 #include <string>
 
+#include "support/zkStringText.h"
 #include "support/zkTempDir.h"
 #include "zkMappedINIFile.h"
-
-inline std::string zkText(const zkStringBase& s) {
-    return std::string(s.data(), s.length());
-}
-
-inline zkStringBase zkStr(const char* text) {
-    return zkStringBase(text);
-}
 
 inline std::string zkTestData(const std::string& name) {
     return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name);
