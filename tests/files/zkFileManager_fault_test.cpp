@@ -12,6 +12,7 @@
 #include <list>
 #include <set>
 #include <string>
+#include <vector>
 
 #include "support/zkTempDir.h"
 #include "zkBasicFile.h"
@@ -25,42 +26,14 @@ int copyFile(const std::string& from, const std::string& to, unsigned recursive,
     return zkFileManager::CopyFile(source, destination, recursive, 0, overwrite, 0, deleteSource, nullptr, nullptr);
 }
 
-// Makes a chain of `depth` folders named "d" below path, working from the
-// current directory so no path grows past the system's limit.
-void makeChain(const std::string& path, int depth) {
-    const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    ASSERT_EQ(0, chdir(path.c_str()));
-    for (int i = 0; i < depth; ++i) ASSERT_TRUE(mkdir("d", 0755) == 0 && chdir("d") == 0) << i;
-    ASSERT_EQ(0, fchdir(home));
-    close(home);
-}
-
-// Removes everything below path, one level at a time through the current
-// directory, for trees whose paths are too long to name.
-void removeBelow(const std::string& path) {
-    const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    int depth = 0;
-    if (chdir(path.c_str()) == 0) {
-        for (;;) {
-            std::string next;
-            for (const std::string& name : zkDirEntries(".")) {
-                struct stat st;
-                if (lstat(name.c_str(), &st) == 0 && S_ISDIR(st.st_mode) && rmdir(name.c_str()) != 0)
-                    next = name;
-                else if (!S_ISDIR(st.st_mode))
-                    unlink(name.c_str());
-            }
-            if (!next.empty() && chdir(next.c_str()) == 0) {
-                ++depth;
-            } else if (depth > 0 && chdir("..") == 0) {
-                --depth;
-            } else {
-                break;
-            }
-        }
-    }
-    fchdir(home);
-    close(home);
+// Names for a chain of folders below top whose deepest path is exactly
+// 4095 bytes, the longest a path may be: a folder "d" below it is past the
+// limit, whatever the length of top.
+std::vector<std::string> chainTo4095(const std::string& top) {
+    std::vector<std::string> names;
+    for (size_t left = 4095 - top.size(); left != 0; left -= names.back().size() + 1)
+        names.emplace_back(left > 256 ? 200 : left - 1, static_cast<char>('a' + names.size()));
+    return names;
 }
 
 }  // namespace
@@ -120,29 +93,36 @@ TEST(FileFault, BasicFileWritesThatFailGiveFailureResults) {
     EXPECT_EQ("ab", zkReadFile(dir.file("limited")));
 }
 
-TEST(FileFault, TreesDeeperThanAnyPathAreListedAndCopiedWithoutCrashing) {
-    constexpr int kDepth = 2100;
+// The chain is made and removed through descriptors, as no path names its end.
+TEST(FileFault, TreesPastThePathLimit) {
     zkTempDir dir;
-    ASSERT_EQ(0, mkdir(dir.file("deep").c_str(), 0755));
-    makeChain(dir.file("deep"), kDepth);
+    const std::string top = dir.file("deep");
+    const std::vector<std::string> names = chainTo4095(top);
+    ASSERT_EQ(0, mkdir(top.c_str(), 0755));
+    int fd = open(top.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    std::string relative = "/", full = top;
+    for (const std::string& name : names) {
+        ASSERT_EQ(0, mkdirat(fd, name.c_str(), 0755)) << name;
+        const int next = openat(fd, name.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+        close(fd);
+        fd = next;
+        relative += name + "/";
+        full += "/" + name;
+    }
+    ASSERT_EQ(4095u, full.size());
+    ASSERT_EQ(0, mkdirat(fd, "d", 0755));
 
-    std::list<zkStringBase> folders;
-    EXPECT_EQ(0, zkFileManager::GetFolderList(dir.file("deep").c_str(), "", folders, 1, 0));
-    ASSERT_FALSE(folders.empty());
-    EXPECT_STREQ("/d/", folders.front().data());
-    unsigned longest = 0;
-    for (const zkStringBase& name : folders) longest = name.length() > longest ? name.length() : longest;
-    EXPECT_EQ(folders.back().length(), longest);
+    // Listed to the end; the copy fails at the deepest nameable folder.
+    std::list<zkStringBase> folders, fullPaths;
+    EXPECT_EQ(0, zkFileManager::GetFolderList(top.c_str(), "", folders, 1, 0));
+    EXPECT_EQ(0, zkFileManager::GetFolderList(top.c_str(), "", fullPaths, 1, 1));
+    EXPECT_EQ(names.size() + 1, folders.size());
+    EXPECT_EQ(relative + "d/", folders.back().data());
+    EXPECT_EQ(full + "/d", fullPaths.back().data());
+    EXPECT_EQ(1, copyFile(top, dir.file("copy"), 1, 0, 0));
 
-    std::list<zkStringBase> full;
-    EXPECT_EQ(0, zkFileManager::GetFolderList(dir.file("deep").c_str(), "", full, 1, 1));
-    EXPECT_FALSE(full.empty());
-
-    // Paths past the system's limit cannot be copied: the copy says so.
-    EXPECT_NE(0, copyFile(dir.file("deep"), dir.file("copy"), 1, 0, 0));
-    EXPECT_EQ(1u, zkDirEntries(dir.file("deep")).size());
-    removeBelow(dir.path());
-    EXPECT_TRUE(zkDirEntries(dir.path()).empty());
+    EXPECT_EQ(0, unlinkat(fd, "d", AT_REMOVEDIR));
+    close(fd);
 }
 
 TEST(FileFault, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
