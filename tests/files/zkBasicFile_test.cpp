@@ -13,7 +13,7 @@ static std::string bytes(const zkStringBase& s) {
     return std::string(s.data(), s.length());
 }
 
-TEST(BasicFile, OpenWriteReadAllAndTheirFailures) {
+TEST(BasicFile, ResultsOfEachCall) {
     zkTempDir dir;
     zkBasicFile file(dir.file("a.txt").c_str(), O_RDWR, O_TRUNC, O_CREAT);  // the three words are joined by OR
     const int next = dup(0);  // the lowest free descriptor, which Open will take
@@ -47,7 +47,7 @@ TEST(BasicFile, OpenWriteReadAllAndTheirFailures) {
     EXPECT_EQ(0, longName.Open());
 }
 
-TEST(BasicFile, PositionsAndSizesPast4GiB) {
+TEST(BasicFile, PositionsPast4GiB) {
     zkTempDir dir;
     const std::string path = dir.file("sparse");
     const unsigned long long size = 0x100000000ull + 10;

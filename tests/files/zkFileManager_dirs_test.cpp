@@ -13,16 +13,19 @@ static std::string current(void (*get)(zkStringBase&)) {
     return path.data();
 }
 
-TEST(FileManagerDirs, DeleteFileRemovesLinksNotTargetsAndDirectoriesOnlyWithTheFlag) {
+TEST(FileManagerDirs, DeleteFileRemovesADirectoryOnlyWithTheFlag) {
     zkTempDir dir;
     zkStringBase sub(dir.file("d").c_str());
     zkFilename link(dir.file("link").c_str());
-    ASSERT_TRUE(mkdir(sub.data(), 0777) == 0 && symlink(sub.data(), link.GetFullPath()) == 0);
+    ASSERT_EQ(0, mkdir(sub.data(), 0777));
+    ASSERT_EQ(0, symlink(sub.data(), link.GetFullPath()));
     EXPECT_EQ(0, zkFileManager::DeleteFile(sub, 0));
-    EXPECT_TRUE(zkFileManager::DeleteFile(link, 0) && zkFileManager::DeleteFile(sub, 1));
+    EXPECT_EQ(1, zkFileManager::DeleteFile(link, 0));
+    EXPECT_EQ(1, zkFileManager::DeleteFile(sub, 1));
+    EXPECT_EQ(0, zkFileManager::DeleteFile(sub, 1));
 }
 
-TEST(FileManagerDirs, CurrentAndModuleDirectoryOfAnyLength) {
+TEST(FileManagerDirs, DirectoryNamesOfAnyLength) {
     const std::string saved = current(zkFileManager::GetCurrentDirectory);
     ASSERT_EQ(0, chdir("/"));
     EXPECT_EQ("/", current(zkFileManager::GetModuleDirectory));
@@ -36,7 +39,8 @@ TEST(FileManagerDirs, CurrentAndModuleDirectoryOfAnyLength) {
     EXPECT_EQ(deep.substr(0, deep.size() - 200), current(zkFileManager::GetModuleDirectory));
     // A current directory that was removed has no name.
     ASSERT_EQ(0, rmdir(deep.c_str()));
-    EXPECT_EQ("", current(zkFileManager::GetCurrentDirectory) + current(zkFileManager::GetModuleDirectory));
+    EXPECT_EQ("", current(zkFileManager::GetCurrentDirectory));
+    EXPECT_EQ("", current(zkFileManager::GetModuleDirectory));
     EXPECT_EQ(0, chdir(saved.c_str()));
 }
 

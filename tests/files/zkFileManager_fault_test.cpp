@@ -75,10 +75,9 @@ TEST(FileFault, BasicFileWritesThatFailGiveFailureResults) {
     EXPECT_EQ(1, under.Write("abc", 3, &count));
 
     zkBasicFile full("/dev/full", 0, O_WRONLY, 0);
-    if (full.Open() == 0) {
-        EXPECT_EQ(1, full.Write("abc", 3, &count));
-        EXPECT_EQ(static_cast<unsigned long>(-1), count);
-    }
+    ASSERT_EQ(0, full.Open());
+    EXPECT_EQ(1, full.Write("abc", 3, &count));
+    EXPECT_EQ(static_cast<unsigned long>(-1), count);
     zkBasicFile limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
     ASSERT_EQ(0, limited.Open());
     int first = 1, second = 0;
