@@ -134,6 +134,7 @@ TEST(FileFault, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
     EXPECT_NE(0, zkFileManager::CreateDirectory((dir.path() + "/a/x/y").c_str(), nullptr));
     EXPECT_EQ(0, zkFileManager::CreateDirectory("plain/a/b", nullptr));
     EXPECT_EQ(0, zkFileManager::CreateDirectory("", nullptr));
+    EXPECT_EQ(0, zkFileManager::CreateDirectory(nullptr, nullptr));
     ASSERT_EQ(0, fchdir(home));
     close(home);
     EXPECT_EQ((std::set<std::string>{"b", "x"}), zkDirEntries(dir.file("a")));

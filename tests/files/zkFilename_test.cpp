@@ -95,6 +95,46 @@ TEST(HandleFiles, CreateFileGivesACloseOnExecHandle) {
     EXPECT_EQ(FD_CLOEXEC, fcntl(out, F_GETFD) & FD_CLOEXEC);
     EXPECT_EQ(-1, CreateFile(dir.file("h").c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr));
     EXPECT_EQ(1, CloseHandle(out));
+    EXPECT_EQ(0, CloseHandle(out));
+    EXPECT_EQ(-1, CreateFile(nullptr, O_RDONLY, 0, 0, 0, 0, nullptr));
+}
+
+TEST(HandleFiles, ReadFileSaysHowMuchItRead) {
+    zkTempDir dir;
+    ASSERT_TRUE(zkWriteFile(dir.file("r"), "abc"));
+    const int in = CreateFile(dir.file("r").c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
+    char buffer[8];
+    unsigned done = 99;
+    EXPECT_EQ(1, ReadFile(in, buffer, sizeof buffer, &done, nullptr));
+    EXPECT_EQ(3u, done);
+    EXPECT_EQ(1, ReadFile(in, buffer, sizeof buffer, &done, nullptr));  // the end
+    EXPECT_EQ(0u, done);
+    CloseHandle(in);
+    done = 99;
+    EXPECT_EQ(0, ReadFile(in, buffer, sizeof buffer, &done, nullptr));
+    EXPECT_EQ(0u, done);
+}
+
+// Names in byte order; a copy goes on from the same name on its own.
+TEST(DirIterator, ListsMatchingNamesInOrder) {
+    zkTempDir dir;
+    for (const char* name : {"b", "a*", "ab", "c"}) ASSERT_TRUE(zkWriteFile(dir.file(name), ""));
+    EXPECT_EQ(nullptr, zkDirIterator((dir.path() + "/x*").c_str()).GetName());
+    EXPECT_STREQ("a*", zkDirIterator((dir.path() + "/a\\*").c_str()).GetName());
+    zkDirIterator it((dir.path() + "/[a-c]*").c_str()), assigned;
+    ++it;
+    zkDirIterator copy(it);
+    assigned = it;
+    assigned = assigned;
+    std::string names;
+    for (; copy != zkDirIterator(); ++copy, ++assigned) {
+        EXPECT_STREQ(copy.GetName(), assigned.GetName());
+        names += std::string(copy.GetName()) + " ";
+    }
+    EXPECT_TRUE(assigned == zkDirIterator());
+    EXPECT_EQ("ab b c ", names);
+    EXPECT_STREQ("ab", it.GetName());
+    EXPECT_FALSE(it == zkDirIterator());
 }
 
 TEST(HandleFiles, GetFileSizeGivesTheHighWordApart) {
@@ -108,6 +148,7 @@ TEST(HandleFiles, GetFileSizeGivesTheHighWordApart) {
     CloseHandle(in);
     EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, &high));
     EXPECT_EQ(0xFFFFFFFFu, high);
+    EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, nullptr));
 }
 
 // A reader drains a pipe and interrupts the writer whenever the pipe is full:
