@@ -48,6 +48,7 @@ TEST(FileManagerCopy, SingleFile) {
     EXPECT_EQ(big + "old", zkReadFile(old));
     EXPECT_EQ(0, copyFile(a, old, 0, 1));  // a longer file is cut to the copy
     EXPECT_EQ(big, zkReadFile(old));
+    EXPECT_EQ(0, copyFile(a, "/dev/null", 0, 1));  // written through, not replaced
     EXPECT_EQ(0, copyFile(a, dir.file("e/*.bak"), 0, 0, 1));
     EXPECT_EQ("a=" + big + " a.bak=" + big + " z.tar.gz= ", tree(dir.file("e")));
     EXPECT_EQ("e/ e/a=" + big + " e/a.bak=" + big + " e/z.tar.gz= old=" + big + " z.tar.gz= ", tree(dir.path()));
@@ -66,9 +67,20 @@ TEST(FileManagerCopy, RefusedCopies) {
     // truncated; opening a FIFO at either end would wait for the other side;
     // a file that holds less than its size says ends the copy early.
     const std::string rows[][2] = {
-        {a, w + "/soft"}, {w + "/soft", a}, {a, w + "/hard"}, {w + "/hard", a}, {a, w + "/./a.txt"},
-        {a, w + "/e/../a.txt"}, {a, w + "/"}, {a, w + "/A.TXT"}, {fifo, w + "/x"}, {a, fifo}, {w + "/none", w + "/x"},
-        {"/sys/devices/system/cpu/online", w + "/x"}, {a, "/dev/full"}, {"http://h/a.txt", w + "/x"},
+        {a, w + "/soft"},
+        {w + "/soft", a},
+        {a, w + "/hard"},
+        {w + "/hard", a},
+        {a, w + "/./a.txt"},
+        {a, w + "/e/../a.txt"},
+        {a, w + "/"},
+        {a, w + "/A.TXT"},
+        {fifo, w + "/x"},
+        {a, fifo},
+        {w + "/none", w + "/x"},
+        {"/sys/devices/system/cpu/online", w + "/x"},
+        {a, "/dev/full"},
+        {"http://h/a.txt", w + "/x"},
         {"ftp://h/a.txt", w + "/x"},
     };
     const std::string before = tree(w);
@@ -79,20 +91,22 @@ TEST(FileManagerCopy, RefusedCopies) {
     }
 }
 
-// A new copy is never more open than its source.
+// A new copy is never more open than its source, also when it could have
+// overwritten a file.
 TEST(FileManagerCopy, NewCopyTakesTheSourcesPermissionsAtMost) {
     zkTempDir dir;
     const mode_t mask = umask(0);
-    for (mode_t mode : {0600u, 0755u, 0666u}) {
-        SCOPED_TRACE(mode);
-        const std::string source = dir.file("s" + std::to_string(mode)), copy = source + ".copy";
-        ASSERT_TRUE(zkWriteFile(source, "x"));
-        ASSERT_EQ(0, chmod(source.c_str(), mode));
-        EXPECT_EQ(0, copyFile(source, copy));
-        struct stat st;
-        ASSERT_EQ(0, stat(copy.c_str(), &st));
-        EXPECT_EQ(mode & 0664u, st.st_mode & 07777u);
-    }
+    for (unsigned overwrite : {0u, 1u})
+        for (mode_t mode : {0600u, 0755u, 0666u}) {
+            SCOPED_TRACE(std::to_string(mode) + (overwrite ? " overwriting" : ""));
+            const std::string source = dir.file("s" + std::to_string(mode)), copy = source + std::to_string(overwrite);
+            ASSERT_TRUE(zkWriteFile(source, "x"));
+            ASSERT_EQ(0, chmod(source.c_str(), mode));
+            EXPECT_EQ(0, copyFile(source, copy, 0, overwrite));
+            struct stat st;
+            ASSERT_EQ(0, stat(copy.c_str(), &st));
+            EXPECT_EQ(mode & 0664u, st.st_mode & 07777u);
+        }
     umask(mask);
 }
 
@@ -131,10 +145,11 @@ TEST(FileManagerCopy, DirectoryCopies) {
     // the source is not copied into itself.
     ASSERT_EQ(0, symlink("..", (src + "/up").c_str()));
     EXPECT_EQ(0, copyFile(src, src + "/in/deep", 1));
-    EXPECT_EQ(".h=/.h a.txt=/a.txt b.log=/b.log in/ in/deep/ in/deep/.h=/.h in/deep/a.txt=/a.txt "
-              "in/deep/b.log=/b.log in/deep/in/ in/deep/sub/ in/deep/sub/c.txt=/sub/c.txt in/deep/up->.. sub/ "
-              "sub/c.txt=/sub/c.txt up->.. ",
-              tree(src));
+    EXPECT_EQ(
+        ".h=/.h a.txt=/a.txt b.log=/b.log in/ in/deep/ in/deep/.h=/.h in/deep/a.txt=/a.txt "
+        "in/deep/b.log=/b.log in/deep/in/ in/deep/sub/ in/deep/sub/c.txt=/sub/c.txt in/deep/up->.. sub/ "
+        "sub/c.txt=/sub/c.txt up->.. ",
+        tree(src));
 }
 
 // A move takes the files and links and leaves the emptied directories.

@@ -12,6 +12,7 @@
 #include <set>
 #include <string>
 
+#include "internal/zkFileSystem.h"
 #include "support/zkTempDir.h"
 #include "zkFileManager.h"
 #include "zkMappedINIFile.h"
@@ -185,4 +186,40 @@ TEST(SafeReplace, NoOtherUserCanOpenTheNewFile) {
     EXPECT_EQ(0600u, modeOf(box.real) & 07777u);
     close(ready[0]);
     close(ready[1]);
+}
+
+TEST(FileSystem, WriteAllGoesOnAfterShortWrites) {
+    std::string data(1 << 19, '\0');
+    for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
+    int result = 1;
+    EXPECT_EQ(data,
+              zkReadFromShortWrites(data.size(), [&](int fd) { result = zkWriteAll(fd, data.data(), data.size()); }));
+    EXPECT_EQ(0, result);
+}
+
+// Relative targets are relative to the link's directory; a loop or a chain
+// longer than the kernel follows fails with ELOOP.
+TEST(FileSystem, ResolveLinksFollowsToTheFileItself) {
+    zkTempDir dir;
+    const std::string d = dir.path() + "/", longest = std::string(4095 - d.size() - 5, '/') + d + "plain";
+    ASSERT_EQ(0, mkdir((d + "sub").c_str(), 0755));
+    const std::string links[][2] = {
+        {"sub/b", "rel"}, {d + "rel", "abs"}, {"loop", "loop"}, {"../abs", "sub/up"}, {longest, "long"}};
+    for (const auto& l : links) ASSERT_EQ(0, symlink(l[0].c_str(), (d + l[1]).c_str())) << l[1];
+    for (int i = 1; i <= 40; ++i)
+        ASSERT_EQ(0, symlink(("a" + std::to_string(i - 1)).c_str(), (d + "a" + std::to_string(i)).c_str()));
+    const std::string rows[][2] = {
+        {"plain", d + "plain"},  {"rel", d + "sub/b"}, {"abs", d + "sub/b"},
+        {"sub/up", d + "sub/b"}, {"a39", d + "a0"},    {"long", longest},
+    };
+    for (const auto& row : rows) {
+        std::string path = d + row[0];
+        EXPECT_TRUE(zkResolveLinks(path)) << row[0];
+        EXPECT_EQ(row[1], path);
+    }
+    for (const char* name : {"a40", "loop"}) {
+        std::string path = d + name;
+        EXPECT_FALSE(zkResolveLinks(path)) << name;
+        EXPECT_EQ(ELOOP, errno) << name;
+    }
 }

@@ -5,10 +5,13 @@
 #define ZK_TESTS_TEMP_DIR_H
 
 #include <dirent.h>
+#include <fcntl.h>
 #include <ftw.h>
+#include <pthread.h>
 #include <signal.h>
 #include <stdio.h>
 #include <stdlib.h>
+#include <sys/ioctl.h>
 #include <sys/resource.h>
 #include <unistd.h>
 
@@ -17,6 +20,7 @@
 #include <set>
 #include <sstream>
 #include <string>
+#include <thread>
 
 class zkTempDir {
 public:
@@ -82,6 +86,39 @@ bool zkWithFileSizeLimit(unsigned long long bytes, Body body) {
     setrlimit(RLIMIT_FSIZE, &saved);
     signal(SIGXFSZ, handler);
     return set;
+}
+
+// Runs write with the write end of a pipe whose reader interrupts the
+// writer with a signal whenever the pipe is full, so that writes of more
+// than the pipe holds return short. Returns what the reader got (after
+// size bytes or the end) and puts the signal's handling back.
+template <class Write>
+std::string zkReadFromShortWrites(size_t size, Write write) {
+    struct sigaction action = {}, saved;
+    action.sa_handler = [](int) {};  // without SA_RESTART
+    int ends[2];
+    if (sigaction(SIGUSR1, &action, &saved) != 0 || pipe2(ends, O_CLOEXEC) != 0) return "";
+    const int capacity = fcntl(ends[1], F_GETPIPE_SZ);
+    const pthread_t writer = pthread_self();
+    std::string got;
+    std::thread reader([&] {
+        char block[4096];
+        for (ssize_t n = 1; n > 0 && got.size() < size; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
+            int queued = 0;
+            for (int spin = 0; spin < 1000 && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity &&
+                               got.size() + static_cast<size_t>(queued) < size;
+                 ++spin)
+                usleep(100);
+            if (queued == capacity) pthread_kill(writer, SIGUSR1);
+            n = read(ends[0], block, sizeof block);
+        }
+    });
+    write(ends[1]);
+    close(ends[1]);
+    reader.join();
+    close(ends[0]);
+    sigaction(SIGUSR1, &saved, nullptr);
+    return got;
 }
 
 #endif
