@@ -45,6 +45,23 @@ TEST(BasicFile, ResultsOfEachCall) {
     EXPECT_EQ(ENAMETOOLONG, errno);
     longName.SetFilename(name.c_str());
     EXPECT_EQ(0, longName.Open());
+    EXPECT_EQ(0, longName.Sync());
+    EXPECT_EQ(zkBasicFile::kBadPosition, longName.SetFilePointer(~0ull, zkBasicFile::SeekBegin));
+}
+
+TEST(BasicFile, ClosedFileFailsEveryCall) {
+    zkBasicFile file;
+    char buffer[4];
+    unsigned long count = 0;
+    zkStringBase text("keep");
+    EXPECT_EQ(1, file.Close());
+    EXPECT_EQ(1, file.Read(buffer, sizeof buffer, &count));
+    EXPECT_EQ(1, file.Write("abc", 3, &count));
+    EXPECT_EQ(1, file.ReadAll(text));
+    EXPECT_EQ(1, file.Sync());
+    EXPECT_EQ(zkBasicFile::kBadPosition, file.SetFilePointer(0, zkBasicFile::SeekBegin));
+    EXPECT_EQ(zkBasicFile::kBadPosition, file.GetSize());
+    EXPECT_STREQ("keep", text.data());
 }
 
 TEST(BasicFile, PositionsPast4GiB) {

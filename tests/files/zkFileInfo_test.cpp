@@ -36,6 +36,11 @@ TEST(FileInfo, GetFileInfoFillsTheRecordOnlyOnSuccess) {
     EXPECT_GT(info.m_ctime, 0);
     EXPECT_LT(info.m_ctime, in2100);
     EXPECT_TRUE(S_ISREG(info.m_mode));
+    // Records are equal only when every field is.
+    zkFileInfo other(info);
+    EXPECT_TRUE(other == info);
+    other.m_mtime++;
+    EXPECT_FALSE(other == info);
     ASSERT_EQ(0, zkFileManager::GetFileInfo(dir.file("plain").c_str(), info));
     EXPECT_STREQ("/keep/plain", info.m_file.GetFullPath());  // the old extension went too
 }

@@ -48,7 +48,8 @@ TEST(FileManagerCopy, SingleFile) {
     EXPECT_EQ(big + "old", zkReadFile(old));
     EXPECT_EQ(0, copyFile(a, old, 0, 1));  // a longer file is cut to the copy
     EXPECT_EQ(big, zkReadFile(old));
-    EXPECT_EQ(0, copyFile(a, "/dev/null", 0, 1));  // written through, not replaced
+    EXPECT_EQ(0, copyFile(a, "/dev/null", 0, 1));         // written through, not replaced
+    EXPECT_EQ(1, copyFile(a, old + "/x/y", 0, 0, 0, 1));  // no directory under a file
     EXPECT_EQ(0, copyFile(a, dir.file("e/*.bak"), 0, 0, 1));
     EXPECT_EQ("a=" + big + " a.bak=" + big + " z.tar.gz= ", tree(dir.file("e")));
     EXPECT_EQ("e/ e/a=" + big + " e/a.bak=" + big + " e/z.tar.gz= old=" + big + " z.tar.gz= ", tree(dir.path()));
@@ -152,14 +153,30 @@ TEST(FileManagerCopy, DirectoryCopies) {
         tree(src));
 }
 
-// A move takes the files and links and leaves the emptied directories.
+// A move takes the files and links and leaves the emptied directories; a
+// link of any length is made again over the one an earlier copy made.
 TEST(FileManagerCopy, TreeMove) {
     zkTempDir dir;
-    const std::string src = dir.file("src");
+    const std::string src = dir.file("src"), far = std::string(300, '/') + "..";
     ASSERT_NE(0, zkFileManager::CreateDirectory((src + "/sub").c_str(), nullptr));
     ASSERT_TRUE(zkWriteFile(src + "/sub/c.txt", "C"));
-    ASSERT_EQ(0, symlink("..", (src + "/sub/up").c_str()));
-    EXPECT_EQ(0, copyFile(src, dir.file("to"), 1, 0, 1));
-    EXPECT_EQ("sub/ sub/c.txt=C sub/up->.. ", tree(dir.file("to")));
+    ASSERT_EQ(0, symlink(far.c_str(), (src + "/sub/up").c_str()));
+    EXPECT_EQ(0, copyFile(src, dir.file("to"), 1));
+    EXPECT_EQ(2, copyFile(src, dir.file("to"), 1));  // the file and the link are there
+    EXPECT_EQ(0, copyFile(src, dir.file("to"), 1, 1, 1));
+    EXPECT_EQ("sub/ sub/c.txt=C sub/up->" + far + " ", tree(dir.file("to")));
     EXPECT_EQ("sub/ ", tree(src));
+}
+
+// A symbolic link instead of a copy: for a file, and for each entry of a
+// directory, since the directory's own path ends in '/'.
+TEST(FileManagerCopy, SymbolicLinkInsteadOfACopy) {
+    zkTempDir dir;
+    ASSERT_EQ(0, mkdir(dir.file("d").c_str(), 0777));
+    ASSERT_TRUE(zkWriteFile(dir.file("d/a"), "A"));
+    zkStringBase file(dir.file("d/a").c_str()), fileLink(dir.file("l").c_str());
+    zkStringBase folder(dir.file("d").c_str()), folderLinks(dir.file("e").c_str());
+    EXPECT_EQ(0, zkFileManager::CopyFile(file, fileLink, 0, 0, 0, 1, 0, nullptr, nullptr));
+    EXPECT_EQ(0, zkFileManager::CopyFile(folder, folderLinks, 0, 0, 0, 1, 0, nullptr, nullptr));
+    EXPECT_EQ("d/ d/a=A e/ e/a->" + dir.file("d/a") + " l->" + dir.file("d/a") + " ", tree(dir.path()));
 }

@@ -66,4 +66,7 @@ TEST(MakePath, InsertsTheChosenSeparator) {
     zkFileManager::m_slash = '/';
     EXPECT_EQ("C:/a\\b\\", windows);
     EXPECT_EQ("\\", root);
+    zkStringBase mixed("a\\b/c");
+    zkFileManager::TranslatePathSeparators(mixed, 0);
+    EXPECT_STREQ("a/b/c", mixed.data());
 }
