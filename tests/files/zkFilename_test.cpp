@@ -121,6 +121,9 @@ TEST(DirIterator, ListsMatchingNamesInOrder) {
     zkDirIterator copy(it);
     assigned = it;
     assigned = assigned;
+    EXPECT_TRUE(copy == it);  // the same name in another buffer
+    EXPECT_FALSE(++zkDirIterator(it) == it);
+    EXPECT_STREQ("dev", zkDirIterator("/de*").GetName());
     std::string names;
     for (; copy != zkDirIterator(); ++copy, ++assigned) {
         EXPECT_STREQ(copy.GetName(), assigned.GetName());
