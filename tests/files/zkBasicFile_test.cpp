@@ -80,3 +80,29 @@ TEST(BasicFile, PositionsPast4GiB) {
     EXPECT_EQ(0, file.ReadAll(text));
     EXPECT_EQ(std::string("keep") + std::string(5, '\0'), bytes(text));
 }
+
+TEST(BasicFile, FailedWritesGiveFailureResults) {
+    zkTempDir dir;
+    ASSERT_TRUE(zkWriteFile(dir.file("plain"), "x"));
+    zkBasicFile under(dir.file("plain/a").c_str(), O_CREAT, O_WRONLY, 0);
+    EXPECT_EQ(1, under.Open());
+    unsigned long count = 0;
+    EXPECT_EQ(1, under.Write("abc", 3, &count));
+
+    zkBasicFile full("/dev/full", 0, O_WRONLY, 0);
+    ASSERT_EQ(0, full.Open());
+    EXPECT_EQ(1, full.Write("abc", 3, &count));
+    EXPECT_EQ(static_cast<unsigned long>(-1), count);
+    zkBasicFile limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
+    ASSERT_EQ(0, limited.Open());
+    int first = 1, second = 0;
+    ASSERT_TRUE(zkWithFileSizeLimit(2, [&] {
+        first = limited.Write("abc", 3, &count);
+        second = limited.Write("d", 1, nullptr);
+    }));
+    EXPECT_EQ(0, first);  // a short write
+    EXPECT_EQ(2u, count);
+    EXPECT_EQ(1, second);
+    EXPECT_EQ(0, limited.Close());
+    EXPECT_EQ("ab", zkReadFile(dir.file("limited")));
+}

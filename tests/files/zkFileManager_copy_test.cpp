@@ -6,6 +6,10 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <list>
+#include <set>
+#include <vector>
+
 #include "support/zkTempDir.h"
 #include "zkFileManager.h"
 
@@ -14,6 +18,16 @@ static int copyFile(const std::string& from, const std::string& to, unsigned rec
                     unsigned deleteSource = 0, unsigned makeDir = 0) {
     zkStringBase source(from.c_str()), target(to.c_str());
     return zkFileManager::CopyFile(source, target, recursive, makeDir, overwrite, 0, deleteSource, nullptr, nullptr);
+}
+
+// Names for a chain of folders below top whose deepest path is exactly
+// 4095 bytes, the longest a path may be: a folder "d" below it is past the
+// limit, whatever the length of top.
+static std::vector<std::string> chainTo4095(const std::string& top) {
+    std::vector<std::string> names;
+    for (size_t left = 4095 - top.size(); left != 0; left -= names.back().size() + 1)
+        names.emplace_back(left > 256 ? 200 : left - 1, static_cast<char>('a' + names.size()));
+    return names;
 }
 
 // The entries below dir in byte order: "name=content", "name/" followed by
@@ -179,4 +193,64 @@ TEST(FileManagerCopy, SymbolicLinkInsteadOfACopy) {
     EXPECT_EQ(0, zkFileManager::CopyFile(file, fileLink, 0, 0, 0, 1, 0, nullptr, nullptr));
     EXPECT_EQ(0, zkFileManager::CopyFile(folder, folderLinks, 0, 0, 0, 1, 0, nullptr, nullptr));
     EXPECT_EQ("d/ d/a=A e/ e/a->" + dir.file("d/a") + " l->" + dir.file("d/a") + " ", tree(dir.path()));
+}
+
+// A new copy or a move that fails at any offset leaves no partial file and
+// keeps the source; overwriting copies are covered with the other replaces.
+TEST(FileManagerCopy, FileSizeLimitAtEveryOffsetLeavesNoPartialFile) {
+    zkTempDir dir;
+    const std::string source = dir.file("a.bin"), destination = dir.file("b.bin");
+    std::string bytes;
+    for (int i = 0; i < 3000; ++i) bytes += static_cast<char>('a' + i % 26);
+    ASSERT_TRUE(zkWriteFile(source, bytes));
+    const std::set<std::string> before = zkDirEntries(dir.path());
+
+    // Every offset near the ends and the block boundaries, a stride between.
+    for (size_t limit = 0; limit < bytes.size(); limit += limit < 16 || limit + 16 > bytes.size() ? 1 : 61) {
+        int copied = 0, moved = 0;
+        ASSERT_TRUE(zkWithFileSizeLimit(limit, [&] {
+            copied = copyFile(source, destination, 0, 0, 0);
+            moved = copyFile(source, dir.file("moved.bin"), 0, 0, 1);
+        }));
+        ASSERT_NE(0, copied) << limit;
+        ASSERT_NE(0, moved) << limit;
+        ASSERT_EQ(bytes, zkReadFile(source)) << limit;
+        ASSERT_EQ(before, zkDirEntries(dir.path())) << limit;
+    }
+    int copied = 1;
+    ASSERT_TRUE(zkWithFileSizeLimit(bytes.size(), [&] { copied = copyFile(source, destination, 0, 0, 0); }));
+    EXPECT_EQ(0, copied);
+    EXPECT_EQ(bytes, zkReadFile(destination));
+}
+
+// The chain is made and removed through descriptors, as no path names its end.
+TEST(FileManagerCopy, TreesPastThePathLimit) {
+    zkTempDir dir;
+    const std::string top = dir.file("deep");
+    const std::vector<std::string> names = chainTo4095(top);
+    ASSERT_EQ(0, mkdir(top.c_str(), 0755));
+    int fd = open(top.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    std::string relative = "/", full = top;
+    for (const std::string& name : names) {
+        ASSERT_EQ(0, mkdirat(fd, name.c_str(), 0755)) << name;
+        const int next = openat(fd, name.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+        close(fd);
+        fd = next;
+        relative += name + "/";
+        full += "/" + name;
+    }
+    ASSERT_EQ(4095u, full.size());
+    ASSERT_EQ(0, mkdirat(fd, "d", 0755));
+
+    // Listed to the end; the copy fails at the deepest nameable folder.
+    std::list<zkStringBase> folders, fullPaths;
+    EXPECT_EQ(0, zkFileManager::GetFolderList(top.c_str(), "", folders, 1, 0));
+    EXPECT_EQ(0, zkFileManager::GetFolderList(top.c_str(), "", fullPaths, 1, 1));
+    EXPECT_EQ(names.size() + 1, folders.size());
+    EXPECT_EQ(relative + "d/", folders.back().data());
+    EXPECT_EQ(full + "/d", fullPaths.back().data());
+    EXPECT_EQ(1, copyFile(top, dir.file("copy"), 1, 0, 0));
+
+    EXPECT_EQ(0, unlinkat(fd, "d", AT_REMOVEDIR));
+    close(fd);
 }

@@ -1,8 +1,12 @@
 // Deletion, the current and module directories and disk space.
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <sys/statfs.h>
 #include <unistd.h>
+
+#include <set>
+#include <string>
 
 #include "support/zkTempDir.h"
 #include "zkFileManager.h"
@@ -55,4 +59,23 @@ TEST(FileManagerDirs, FreeDiskSpaceIsBlockSizeTimesAvailableBlocks) {
         ASSERT_EQ(0, statfs(dir.path().c_str(), &after));
     } while (before.f_bavail != after.f_bavail);
     EXPECT_EQ(static_cast<long long>(static_cast<unsigned long long>(before.f_bsize) * before.f_bavail), space);
+}
+
+TEST(FileManagerDirs, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
+    zkTempDir dir;
+    ASSERT_TRUE(zkWriteFile(dir.file("plain"), "x"));
+    const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    ASSERT_EQ(0, chdir(dir.path().c_str()));
+    EXPECT_NE(0, zkFileManager::CreateDirectory("a//b/c/", nullptr));
+    EXPECT_NE(0, zkFileManager::CreateDirectory("a/b/c", nullptr));  // already there
+    EXPECT_NE(0, zkFileManager::CreateDirectory((dir.path() + "/a/x/y").c_str(), nullptr));
+    EXPECT_EQ(0, zkFileManager::CreateDirectory("plain/a/b", nullptr));
+    EXPECT_EQ(0, zkFileManager::CreateDirectory("", nullptr));
+    EXPECT_EQ(0, zkFileManager::CreateDirectory(nullptr, nullptr));
+    ASSERT_EQ(0, fchdir(home));
+    close(home);
+    EXPECT_EQ((std::set<std::string>{"b", "x"}), zkDirEntries(dir.file("a")));
+    EXPECT_EQ((std::set<std::string>{"c"}), zkDirEntries(dir.file("a/b")));
+    EXPECT_EQ((std::set<std::string>{"y"}), zkDirEntries(dir.file("a/x")));
+    EXPECT_EQ("x", zkReadFile(dir.file("plain")));
 }
