@@ -155,7 +155,7 @@ TEST(HandleFiles, WriteFileGoesOnAfterShortWrites) {
     for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
     unsigned done = 0;
     int result = 0;
-    EXPECT_EQ(data, zkReadFromShortWrites(data.size(), [&](int fd) {
+    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) {
                   result = WriteFile(fd, data.data(), static_cast<unsigned>(data.size()), &done, nullptr);
               }));
     EXPECT_EQ(1, result);

@@ -185,8 +185,7 @@ TEST(FileSystem, WriteAllGoesOnAfterShortWrites) {
     std::string data(1 << 19, '\0');
     for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
     int result = 1;
-    EXPECT_EQ(data,
-              zkReadFromShortWrites(data.size(), [&](int fd) { result = zkWriteAll(fd, data.data(), data.size()); }));
+    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) { result = zkWriteAll(fd, data.data(), data.size()); }));
     EXPECT_EQ(0, result);
 }
 

@@ -15,6 +15,7 @@
 #include <sys/resource.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <fstream>
 #include <iterator>
 #include <set>
@@ -90,30 +91,29 @@ bool zkWithFileSizeLimit(unsigned long long bytes, Body body) {
 
 // Runs write with the write end of a pipe whose reader interrupts the
 // writer with a signal whenever the pipe is full, so that writes of more
-// than the pipe holds return short. Returns what the reader got (after
-// size bytes or the end) and puts the signal's handling back.
+// than the pipe holds return short. Returns all that the reader got and
+// puts the signal's handling back.
 template <class Write>
-std::string zkReadFromShortWrites(size_t size, Write write) {
+std::string zkReadFromShortWrites(Write write) {
     struct sigaction action = {}, saved;
     action.sa_handler = [](int) {};  // without SA_RESTART
     int ends[2];
     if (sigaction(SIGUSR1, &action, &saved) != 0 || pipe2(ends, O_CLOEXEC) != 0) return "";
     const int capacity = fcntl(ends[1], F_GETPIPE_SZ);
     const pthread_t writer = pthread_self();
+    std::atomic<bool> finished{false};
     std::string got;
     std::thread reader([&] {
         char block[4096];
-        for (ssize_t n = 1; n > 0 && got.size() < size; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
+        for (ssize_t n = 1; n > 0; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
             int queued = 0;
-            for (int spin = 0; spin < 1000 && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity &&
-                               got.size() + static_cast<size_t>(queued) < size;
-                 ++spin)
-                usleep(100);
-            if (queued == capacity) pthread_kill(writer, SIGUSR1);
+            while (!finished && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity) usleep(100);
+            if (!finished) pthread_kill(writer, SIGUSR1);
             n = read(ends[0], block, sizeof block);
         }
     });
     write(ends[1]);
+    finished = true;
     close(ends[1]);
     reader.join();
     close(ends[0]);
