@@ -28,7 +28,12 @@ public:
     zkTempDir() {
         const char* base = getenv("TMPDIR");
         std::string pattern = std::string(base && *base ? base : "/tmp") + "/zkutil-test-XXXXXX";
-        if (mkdtemp(&pattern[0]) != nullptr) m_path = pattern;
+        // Without the directory every path would name a file in the root.
+        if (mkdtemp(&pattern[0]) == nullptr) {
+            perror(pattern.c_str());
+            abort();
+        }
+        m_path = pattern;
     }
     ~zkTempDir() {
         if (!m_path.empty()) nftw(m_path.c_str(), removeEntry, 16, FTW_DEPTH | FTW_PHYS);
@@ -36,7 +41,7 @@ public:
     zkTempDir(const zkTempDir&) = delete;
     zkTempDir& operator=(const zkTempDir&) = delete;
 
-    // The directory, without a trailing slash; empty if it could not be made.
+    // The directory, without a trailing slash.
     const std::string& path() const { return m_path; }
     // The path of `name` inside the directory.
     std::string file(const std::string& name) const { return m_path + "/" + name; }
