@@ -27,6 +27,7 @@ TEST(FileManagerDirs, DeleteFileRemovesADirectoryOnlyWithTheFlag) {
     EXPECT_EQ(1, zkFileManager::DeleteFile(link, 0));
     EXPECT_EQ(1, zkFileManager::DeleteFile(sub, 1));
     EXPECT_EQ(0, zkFileManager::DeleteFile(sub, 1));
+    EXPECT_EQ(0, zkUnlink(nullptr, 0));
 }
 
 TEST(FileManagerDirs, DirectoryNamesOfAnyLength) {

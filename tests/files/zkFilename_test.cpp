@@ -57,6 +57,7 @@ TEST(Filename, SettersRebuildThePath) {
         {"/d/a.txt", &zkFilename::SetName, "", "/d/.txt=/d/||txt|file"},
         {"/d/a.txt", &zkFilename::SetExtension, ".gz", "/d/a.gz=/d/|a|gz|file"},
         {"/d/a.b.c", &zkFilename::SetExtension, "", "/d/a.b=/d/|a|b|file"},
+        {"x.y", &zkFilename::SetExtension, "", "x=|x||file"},
         {"/d/a.txt", &zkFilename::SetDirectory, "/x", "/x/a.txt=/x/|a|txt|file"},
         {"/d/a.txt", &zkFilename::SetDirectory, "", "a.txt=|a|txt|file"},
         {"/d/a.txt", &zkFilename::SetDirectory, "ftp://h/", "ftp://h/a.txt=ftp://h/|a|txt|ftp"},
