@@ -142,6 +142,26 @@ TEST(SafeReplace, FailedReplaceKeepsTheOldFile) {
     }
 }
 
+// A source that holds less than its size says fails the copy after some
+// bytes are written, beside the file or in place (which reserves the size
+// the source claims first): the old bytes and length come back.
+TEST(SafeReplace, CopyOfAShortSourceKeepsTheOldFile) {
+    static const char* const shortFile = "/sys/devices/system/cpu/online";
+    struct stat st;
+    if (stat(shortFile, &st) != 0 || zkReadFile(shortFile).size() >= static_cast<size_t>(st.st_size))
+        GTEST_SKIP() << "no file here holds less than its size";
+    const Caller shortCopy = {"copy of a short source", [](const zkTempDir&, const std::string& target) {
+                                  zkStringBase from(shortFile), to(target.c_str());
+                                  return zkFileManager::CopyFile(from, to, 0, 0, 1, 0, 0, nullptr, nullptr);
+                              }};
+    for (const Target& t : {kTargets[0], kTargets[5]}) {
+        SCOPED_TRACE(t.name);
+        Sandbox box(t);
+        EXPECT_EQ(1, box.replace(shortCopy, RLIM_INFINITY));
+        EXPECT_EQ(kOld, zkReadFile(box.real));
+    }
+}
+
 // With umask 000, a 0600 file's replacement is never open to another user:
 // a child of another user tries to open every file that appears in the
 // directory while saves and copies run.
