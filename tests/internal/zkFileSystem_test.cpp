@@ -246,3 +246,26 @@ TEST(FileSystem, ResolveLinksFollowsToTheFileItself) {
         EXPECT_EQ(ELOOP, errno) << name;
     }
 }
+
+// Every failure gives 1, with the first failure's errno, and leaves the
+// directory as it was.
+TEST(FileSystem, FailuresGiveOne) {
+    zkTempDir dir;
+    ASSERT_EQ(0, symlink("loop", dir.file("loop").c_str()));
+    ASSERT_TRUE(zkWriteFile(dir.file("f"), "x"));
+    const zkContentWriter writes = [](int fd) { return zkWriteAll(fd, "y", 1) == 0; };
+    const zkContentWriter fails = [](int) {
+        errno = EIO;
+        return false;
+    };
+    for (const std::string& path : {std::string(), dir.file("loop"), dir.file("f/x"), dir.file("none/x")})
+        EXPECT_EQ(1, zkReplaceFile(path.c_str(), 0644, 0, writes)) << path;
+    EXPECT_EQ(1, zkReplaceFile(nullptr, 0644, 0, writes));
+    EXPECT_EQ(1, zkReplaceFile(dir.file("f").c_str(), 0644, 0, fails));
+    EXPECT_EQ(EIO, errno);
+    EXPECT_EQ(1, zkCreateNewFile(dir.file("f").c_str(), 0644, false, writes));
+    EXPECT_EQ(1, zkCreateNewFile(dir.file("n").c_str(), 0644, true, fails));
+    EXPECT_EQ(EIO, errno);
+    EXPECT_EQ("x", zkReadFile(dir.file("f")));
+    EXPECT_EQ((std::set<std::string>{"f", "loop"}), zkDirEntries(dir.path()));
+}
