@@ -124,7 +124,9 @@ int copyContents(zkFilename& source, zkFilename& destination, const Options& opt
     if (in == -1) return 1;
     const unsigned long long size = static_cast<unsigned long long>(from.st_size);
     const mode_t mode = kCreatedMode & from.st_mode;
-    auto copy = [in, size](int out) { return copyData(in, out, size); };
+    // The writer may run twice, beside the file and then in place when the
+    // rename is refused, so each run starts from the source's first byte.
+    auto copy = [in, size](int out) { return lseek(in, 0, SEEK_SET) == 0 && copyData(in, out, size); };
     int failed = options.overwrite ? zkReplaceFile(destination.GetFullPath(), mode, size, copy)
                                    : zkCreateNewFile(destination.GetFullPath(), mode, options.deleteSource != 0, copy);
     CloseHandle(in);

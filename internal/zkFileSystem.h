@@ -4,7 +4,8 @@
 // new file that a copy creates goes through zkCreateNewFile. Both take the
 // new contents from a writer callback that writes to the descriptor it is
 // given (through zkWriteAll or its own loop) and returns false on failure,
-// with errno set.
+// with errno set. A writer may run twice: once beside the file and again
+// in place when the rename is refused.
 //
 // Results follow one rule: 0 done, 1 failed with errno telling why (the
 // first failure's errno, kept across the cleanup that follows it).

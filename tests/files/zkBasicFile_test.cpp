@@ -13,7 +13,7 @@ static std::string bytes(const zkStringBase& s) {
     return std::string(s.data(), s.length());
 }
 
-TEST(BasicFile, OpenWriteReadAllAndTheirFailures) {
+TEST(BasicFile, ResultsOfEachCall) {
     zkTempDir dir;
     zkBasicFile file(dir.file("a.txt").c_str(), O_RDWR, O_TRUNC, O_CREAT);  // the three words are joined by OR
     const int next = dup(0);  // the lowest free descriptor, which Open will take
@@ -45,9 +45,26 @@ TEST(BasicFile, OpenWriteReadAllAndTheirFailures) {
     EXPECT_EQ(ENAMETOOLONG, errno);
     longName.SetFilename(name.c_str());
     EXPECT_EQ(0, longName.Open());
+    EXPECT_EQ(0, longName.Sync());
+    EXPECT_EQ(zkBasicFile::kBadPosition, longName.SetFilePointer(~0ull, zkBasicFile::SeekBegin));
 }
 
-TEST(BasicFile, PositionsAndSizesPast4GiB) {
+TEST(BasicFile, ClosedFileFailsEveryCall) {
+    zkBasicFile file;
+    char buffer[4];
+    unsigned long count = 0;
+    zkStringBase text("keep");
+    EXPECT_EQ(1, file.Close());
+    EXPECT_EQ(1, file.Read(buffer, sizeof buffer, &count));
+    EXPECT_EQ(1, file.Write("abc", 3, &count));
+    EXPECT_EQ(1, file.ReadAll(text));
+    EXPECT_EQ(1, file.Sync());
+    EXPECT_EQ(zkBasicFile::kBadPosition, file.SetFilePointer(0, zkBasicFile::SeekBegin));
+    EXPECT_EQ(zkBasicFile::kBadPosition, file.GetSize());
+    EXPECT_STREQ("keep", text.data());
+}
+
+TEST(BasicFile, PositionsPast4GiB) {
     zkTempDir dir;
     const std::string path = dir.file("sparse");
     const unsigned long long size = 0x100000000ull + 10;
@@ -62,4 +79,30 @@ TEST(BasicFile, PositionsAndSizesPast4GiB) {
     EXPECT_EQ(size - 5, file.SetFilePointer(size - 5, zkBasicFile::SeekBegin));
     EXPECT_EQ(0, file.ReadAll(text));
     EXPECT_EQ(std::string("keep") + std::string(5, '\0'), bytes(text));
+}
+
+TEST(BasicFile, FailedWritesGiveFailureResults) {
+    zkTempDir dir;
+    ASSERT_TRUE(zkWriteFile(dir.file("plain"), "x"));
+    zkBasicFile under(dir.file("plain/a").c_str(), O_CREAT, O_WRONLY, 0);
+    EXPECT_EQ(1, under.Open());
+    unsigned long count = 0;
+    EXPECT_EQ(1, under.Write("abc", 3, &count));
+
+    zkBasicFile full("/dev/full", 0, O_WRONLY, 0);
+    ASSERT_EQ(0, full.Open());
+    EXPECT_EQ(1, full.Write("abc", 3, &count));
+    EXPECT_EQ(static_cast<unsigned long>(-1), count);
+    zkBasicFile limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
+    ASSERT_EQ(0, limited.Open());
+    int first = 1, second = 0;
+    ASSERT_TRUE(zkWithFileSizeLimit(2, [&] {
+        first = limited.Write("abc", 3, &count);
+        second = limited.Write("d", 1, nullptr);
+    }));
+    EXPECT_EQ(0, first);  // a short write
+    EXPECT_EQ(2u, count);
+    EXPECT_EQ(1, second);
+    EXPECT_EQ(0, limited.Close());
+    EXPECT_EQ("ab", zkReadFile(dir.file("limited")));
 }

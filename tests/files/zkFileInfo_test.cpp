@@ -8,13 +8,14 @@
 #include "zkFileInfo.h"
 #include "zkFileManager.h"
 
-TEST(FileInfo, GetFileInfoFillsTheRecordOrLeavesItAlone) {
+TEST(FileInfo, GetFileInfoFillsTheRecordOnlyOnSuccess) {
     zkTempDir dir;
     const std::string path = dir.file("a.b.txt");
     // Sizes past 4 GiB and dates past 2038 keep their values.
     const long long in2100 = 4102444800ll;
     const struct timespec times[2] = {{static_cast<time_t>(in2100), 0}, {static_cast<time_t>(in2100 + 7), 0}};
-    ASSERT_TRUE(zkWriteFile(path, "") && zkWriteFile(dir.file("plain"), "1"));
+    ASSERT_TRUE(zkWriteFile(path, ""));
+    ASSERT_TRUE(zkWriteFile(dir.file("plain"), "1"));
     ASSERT_EQ(0, truncate(path.c_str(), 5ll << 30));
     ASSERT_EQ(0, utimensat(AT_FDCWD, path.c_str(), times, 0));
 
@@ -32,8 +33,14 @@ TEST(FileInfo, GetFileInfoFillsTheRecordOrLeavesItAlone) {
     EXPECT_EQ(5ull << 30, info.m_size);
     EXPECT_EQ(in2100, info.m_atime);
     EXPECT_EQ(in2100 + 7, info.m_mtime);
-    EXPECT_TRUE(info.m_ctime > 0 && info.m_ctime < in2100);
+    EXPECT_GT(info.m_ctime, 0);
+    EXPECT_LT(info.m_ctime, in2100);
     EXPECT_TRUE(S_ISREG(info.m_mode));
+    // Records are equal only when every field is.
+    zkFileInfo other(info);
+    EXPECT_TRUE(other == info);
+    other.m_mtime++;
+    EXPECT_FALSE(other == info);
     ASSERT_EQ(0, zkFileManager::GetFileInfo(dir.file("plain").c_str(), info));
     EXPECT_STREQ("/keep/plain", info.m_file.GetFullPath());  // the old extension went too
 }

@@ -64,5 +64,9 @@ TEST(MakePath, InsertsTheChosenSeparator) {
     zkFileManager::m_slash = '\\';
     const std::string windows = joined("C:/a", "b", 0), root = joined("", "..", 1);
     zkFileManager::m_slash = '/';
-    EXPECT_EQ("C:/a\\b\\ \\", windows + " " + root);
+    EXPECT_EQ("C:/a\\b\\", windows);
+    EXPECT_EQ("\\", root);
+    zkStringBase mixed("a\\b/c");
+    zkFileManager::TranslatePathSeparators(mixed, 0);
+    EXPECT_STREQ("a/b/c", mixed.data());
 }

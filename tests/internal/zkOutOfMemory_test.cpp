@@ -4,7 +4,7 @@
 
 #include "internal/zkOutOfMemory.h"
 
-TEST(OutOfMemoryDeathTest, SaysSoOnStandardErrorAndExitsWithStatusOne) {
+TEST(OutOfMemoryDeathTest, ExitsWithStatusOneSayingSo) {
     EXPECT_EXIT(zkOutOfMemory(), ::testing::ExitedWithCode(1), "^out of memory\n$");
 }
 

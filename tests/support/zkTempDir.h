@@ -5,25 +5,35 @@
 #define ZK_TESTS_TEMP_DIR_H
 
 #include <dirent.h>
+#include <fcntl.h>
 #include <ftw.h>
+#include <pthread.h>
 #include <signal.h>
 #include <stdio.h>
 #include <stdlib.h>
+#include <sys/ioctl.h>
 #include <sys/resource.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <fstream>
 #include <iterator>
 #include <set>
 #include <sstream>
 #include <string>
+#include <thread>
 
 class zkTempDir {
 public:
     zkTempDir() {
         const char* base = getenv("TMPDIR");
         std::string pattern = std::string(base && *base ? base : "/tmp") + "/zkutil-test-XXXXXX";
-        if (mkdtemp(&pattern[0]) != nullptr) m_path = pattern;
+        // Without the directory every path would name a file in the root.
+        if (mkdtemp(&pattern[0]) == nullptr) {
+            perror(pattern.c_str());
+            abort();
+        }
+        m_path = pattern;
     }
     ~zkTempDir() {
         if (!m_path.empty()) nftw(m_path.c_str(), removeEntry, 16, FTW_DEPTH | FTW_PHYS);
@@ -31,7 +41,7 @@ public:
     zkTempDir(const zkTempDir&) = delete;
     zkTempDir& operator=(const zkTempDir&) = delete;
 
-    // The directory, without a trailing slash; empty if it could not be made.
+    // The directory, without a trailing slash.
     const std::string& path() const { return m_path; }
     // The path of `name` inside the directory.
     std::string file(const std::string& name) const { return m_path + "/" + name; }
@@ -82,6 +92,38 @@ bool zkWithFileSizeLimit(unsigned long long bytes, Body body) {
     setrlimit(RLIMIT_FSIZE, &saved);
     signal(SIGXFSZ, handler);
     return set;
+}
+
+// Runs write with the write end of a pipe whose reader interrupts the
+// writer with a signal whenever the pipe is full, so that writes of more
+// than the pipe holds return short. Returns all that the reader got and
+// puts the signal's handling back.
+template <class Write>
+std::string zkReadFromShortWrites(Write write) {
+    struct sigaction action = {}, saved;
+    action.sa_handler = [](int) {};  // without SA_RESTART
+    int ends[2];
+    if (sigaction(SIGUSR1, &action, &saved) != 0 || pipe2(ends, O_CLOEXEC) != 0) return "";
+    const int capacity = fcntl(ends[1], F_GETPIPE_SZ);
+    const pthread_t writer = pthread_self();
+    std::atomic<bool> finished{false};
+    std::string got;
+    std::thread reader([&] {
+        char block[4096];
+        for (ssize_t n = 1; n > 0; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
+            int queued = 0;
+            while (!finished && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity) usleep(100);
+            if (!finished) pthread_kill(writer, SIGUSR1);
+            n = read(ends[0], block, sizeof block);
+        }
+    });
+    write(ends[1]);
+    finished = true;
+    close(ends[1]);
+    reader.join();
+    close(ends[0]);
+    sigaction(SIGUSR1, &saved, nullptr);
+    return got;
 }
 
 #endif
