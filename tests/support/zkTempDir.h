@@ -94,6 +94,13 @@ bool zkWithFileSizeLimit(unsigned long long bytes, Body body) {
     return set;
 }
 
+// Whether the tests run under a user-mode emulator (the i386 build under
+// qemu-i386), whose signal delivery into blocking calls differs from the
+// kernel's: a thread joined after such a signal fails there.
+inline bool zkUnderEmulator() {
+    return getenv("ZK_TEST_UNDER_EMULATOR") != nullptr;
+}
+
 // Runs write with the write end of a pipe whose reader interrupts the
 // writer with a signal whenever the pipe is full, so that writes of more
 // than the pipe holds return short. Returns all that the reader got and
