@@ -11,6 +11,21 @@
 #include <cstdio>
 #include <vector>
 
+zkSystemCalls zkSystem = {
+    [](const char* path, int flags, mode_t mode) { return ::open(path, flags, mode); },
+    ::close,
+    ::write,
+    [](int fd, void* data, size_t size, off_t offset) { return ::pread(fd, data, size, offset); },
+    [](int fd, const void* data, size_t size, off_t offset) { return ::pwrite(fd, data, size, offset); },
+    ::fsync,
+    [](int fd, off_t length) { return ::ftruncate(fd, length); },
+    [](int fd, off_t offset, off_t length) { return ::posix_fallocate(fd, offset, length); },
+    ::rename,
+    ::readlink,
+    ::fchown,
+    ::fchmod,
+};
+
 namespace {
 
 // Symbolic links followed before giving up, as the kernel does.
@@ -55,12 +70,12 @@ std::string tempName(const std::string& target) {
 
 int closeChecked(int fd) {
     // Linux releases the descriptor even when close is interrupted.
-    return close(fd) == 0 || errno == EINTR ? 0 : 1;
+    return zkSystem.close(fd) == 0 || errno == EINTR ? 0 : 1;
 }
 
 int fail(int fd) {
     zkErrnoKeeper keep;
-    if (fd != -1) close(fd);
+    if (fd != -1) zkSystem.close(fd);
     return 1;
 }
 
@@ -80,15 +95,15 @@ int createBeside(const std::string& target, mode_t mode, std::string& temp) {
 // the group may be ours to give, or neither, so those refusals are no
 // failure.
 int takeOverMode(int fd, const struct stat& old) {
-    if (fchown(fd, old.st_uid, old.st_gid) != 0) (void)fchown(fd, static_cast<uid_t>(-1), old.st_gid);
-    return fchmod(fd, old.st_mode & kPermissionBits) == 0 ? 0 : 1;
+    if (zkSystem.fchown(fd, old.st_uid, old.st_gid) != 0) (void)zkSystem.fchown(fd, static_cast<uid_t>(-1), old.st_gid);
+    return zkSystem.fchmod(fd, old.st_mode & kPermissionBits) == 0 ? 0 : 1;
 }
 
 // Writes through fd, flushes it when sync and closes it: 0, or 1 with errno
 // (fd closed either way).
 int writeAndClose(int fd, const zkContentWriter& write, bool sync) {
     if (!write(fd)) return fail(fd);
-    if (sync && fsync(fd) != 0) return fail(fd);
+    if (sync && zkSystem.fsync(fd) != 0) return fail(fd);
     return closeChecked(fd);
 }
 
@@ -111,7 +126,7 @@ Outcome replaceBeside(const std::string& target, const struct stat* old, mode_t 
     int fd = createBeside(target, old ? kPrivateMode : newMode, temp);
     if (fd == -1) return refusedHere(errno) ? Outcome::NotHere : Outcome::Failed;
     int failed = old && takeOverMode(fd, *old) != 0 ? fail(fd) : writeAndClose(fd, write, old != nullptr);
-    if (!failed && rename(temp.c_str(), target.c_str()) != 0) failed = refusedHere(errno) ? 2 : 1;
+    if (!failed && zkSystem.rename(temp.c_str(), target.c_str()) != 0) failed = refusedHere(errno) ? 2 : 1;
     if (failed) {
         zkErrnoKeeper keep;
         unlink(temp.c_str());
@@ -126,7 +141,7 @@ bool readAll(int fd, std::vector<char>& bytes, size_t size) {
     bytes.resize(size);
     size_t got = 0;
     while (got < size) {
-        ssize_t n = pread(fd, bytes.data() + got, size - got, static_cast<off_t>(got));
+        ssize_t n = zkSystem.pread(fd, bytes.data() + got, size - got, static_cast<off_t>(got));
         if (n < 0 && errno == EINTR) continue;
         if (n < 0) return false;
         if (n == 0) break;
@@ -142,13 +157,13 @@ void restore(int fd, const std::vector<char>& old) {
     zkErrnoKeeper keep;
     size_t put = 0;
     while (put < old.size()) {
-        ssize_t n = pwrite(fd, old.data() + put, old.size() - put, static_cast<off_t>(put));
+        ssize_t n = zkSystem.pwrite(fd, old.data() + put, old.size() - put, static_cast<off_t>(put));
         if (n < 0 && errno == EINTR) continue;
         if (n <= 0) break;
         put += static_cast<size_t>(n);
     }
-    (void)ftruncate(fd, static_cast<off_t>(old.size()));
-    (void)fsync(fd);
+    (void)zkSystem.ftruncate(fd, static_cast<off_t>(old.size()));
+    (void)zkSystem.fsync(fd);
 }
 
 // Rewrites a regular file where it stands, for a directory that admits no
@@ -162,7 +177,7 @@ int rewriteInPlace(const std::string& target, unsigned long long sizeHint, const
     std::vector<char> old;
     if (fstat(fd, &st) != 0 || !readAll(fd, old, static_cast<size_t>(st.st_size))) return fail(fd);
     if (sizeHint > old.size()) {
-        int error = posix_fallocate(fd, static_cast<off_t>(old.size()), static_cast<off_t>(sizeHint - old.size()));
+        int error = zkSystem.allocate(fd, static_cast<off_t>(old.size()), static_cast<off_t>(sizeHint - old.size()));
         // A file system that cannot reserve space says so with EOPNOTSUPP or
         // EINVAL; the write then finds out.
         if (error != 0 && error != EOPNOTSUPP && error != EINVAL) {
@@ -173,7 +188,7 @@ int rewriteInPlace(const std::string& target, unsigned long long sizeHint, const
     }
     bool written = write(fd);
     off_t end = written ? lseek(fd, 0, SEEK_CUR) : -1;
-    if (end == -1 || ftruncate(fd, end) != 0 || fsync(fd) != 0) {
+    if (end == -1 || zkSystem.ftruncate(fd, end) != 0 || zkSystem.fsync(fd) != 0) {
         restore(fd, old);
         return fail(fd);
     }
@@ -186,7 +201,7 @@ int writeThrough(const std::string& target, const zkContentWriter& write) {
     if (fd == -1) return 1;
     if (!write(fd)) return fail(fd);
     // Devices and pipes cannot be flushed and say so with EINVAL.
-    if (fsync(fd) != 0 && errno != EINVAL) return fail(fd);
+    if (zkSystem.fsync(fd) != 0 && errno != EINVAL) return fail(fd);
     return closeChecked(fd);
 }
 
@@ -195,7 +210,7 @@ int writeThrough(const std::string& target, const zkContentWriter& write) {
 int zkOpen(const char* path, int flags, mode_t mode) {
     int fd;
     do {
-        fd = open(path, flags | O_CLOEXEC, mode);
+        fd = zkSystem.open(path, flags | O_CLOEXEC, mode);
     } while (fd == -1 && errno == EINTR);
     return fd;
 }
@@ -203,7 +218,7 @@ int zkOpen(const char* path, int flags, mode_t mode) {
 int zkWriteAll(int fd, const void* data, size_t size) {
     const char* bytes = static_cast<const char*>(data);
     while (size != 0) {
-        ssize_t n = ::write(fd, bytes, size);
+        ssize_t n = zkSystem.write(fd, bytes, size);
         if (n < 0 && errno == EINTR) continue;
         if (n < 0) return 1;
         // A write that takes nothing would repeat forever.
@@ -222,7 +237,7 @@ bool zkResolveLinks(std::string& path) {
         struct stat st;
         if (lstat(path.c_str(), &st) != 0 || !S_ISLNK(st.st_mode)) return true;
         std::string target(kLinkTargetSize, '\0');
-        ssize_t n = readlink(path.c_str(), &target[0], target.size());
+        ssize_t n = zkSystem.readlink(path.c_str(), &target[0], target.size());
         if (n < 0) return false;
         if (static_cast<size_t>(n) >= target.size()) {
             errno = ENAMETOOLONG;
@@ -241,8 +256,8 @@ void zkSyncDirectoryOf(const std::string& path) {
     std::string directory = directoryOf(path);
     int fd = zkOpen(directory.empty() ? "." : directory.c_str(), O_RDONLY | O_DIRECTORY, 0);
     if (fd == -1) return;
-    (void)fsync(fd);
-    close(fd);
+    (void)zkSystem.fsync(fd);
+    zkSystem.close(fd);
 }
 
 int zkReplaceFile(const char* path, mode_t newMode, unsigned long long sizeHint, const zkContentWriter& write) {

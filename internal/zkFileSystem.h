@@ -21,6 +21,27 @@
 #include <memory>
 #include <string>
 
+// The system calls through which this boundary reads, writes, flushes and
+// renames files, gathered in one table: the library uses the real calls, and
+// a test may replace an entry to make that call fail. allocate answers like
+// posix_fallocate (0 or an error number); the others like the calls they name.
+struct zkSystemCalls {
+    int (*open)(const char* path, int flags, mode_t mode);
+    int (*close)(int fd);
+    ssize_t (*write)(int fd, const void* data, size_t size);
+    ssize_t (*pread)(int fd, void* data, size_t size, off_t offset);
+    ssize_t (*pwrite)(int fd, const void* data, size_t size, off_t offset);
+    int (*fsync)(int fd);
+    int (*ftruncate)(int fd, off_t length);
+    int (*allocate)(int fd, off_t offset, off_t length);
+    int (*rename)(const char* from, const char* to);
+    ssize_t (*readlink)(const char* path, char* target, size_t size);
+    int (*fchown)(int fd, uid_t owner, gid_t group);
+    int (*fchmod)(int fd, mode_t mode);
+};
+
+extern zkSystemCalls zkSystem;
+
 // Keeps errno across cleanup calls that may change it, so a failure's errno
 // reaches the caller.
 class zkErrnoKeeper {

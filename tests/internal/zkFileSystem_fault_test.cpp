@@ -1,0 +1,175 @@
+// Single system calls made to fail through the boundary's call table. A
+// failed replace leaves the old bytes, owner and group, no other file and no
+// open descriptor, and reports the failing call's errno; an interrupted call
+// is retried; a refused rename falls back to rewriting in place.
+#include <dirent.h>
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <string>
+#include <type_traits>
+
+#include "internal/zkFileSystem.h"
+#include "support/zkTempDir.h"
+
+namespace {
+
+const zkSystemCalls kRealCalls = zkSystem;
+const std::string kOld = "old bytes\n";
+const std::string kNew = "the new bytes, longer than the old\n";
+constexpr gid_t kOtherGroup = 65534;
+
+// How one entry misbehaves: its nth call (0: every call) answers result with
+// errno set to error; the other calls reach the real one.
+struct Fault {
+    long nth, result;
+    int error;
+};
+
+// Linux releases the descriptor even when close reports a failure.
+template <auto Entry>
+constexpr bool kReleasesFirst = false;
+template <>
+constexpr bool kReleasesFirst<&zkSystemCalls::close> = true;
+
+template <auto Entry, typename Call = std::remove_reference_t<decltype(zkSystem.*Entry)>>
+struct Faulty;
+
+template <auto Entry, typename R, typename... A>
+struct Faulty<Entry, R (*)(A...)> {
+    static inline Fault fault;
+    static inline long calls;
+    static R call(A... args) {
+        ++calls;
+        if (fault.nth != 0 && fault.nth != calls) return (kRealCalls.*Entry)(args...);
+        if constexpr (kReleasesFirst<Entry>) (kRealCalls.*Entry)(args...);
+        errno = fault.error;
+        return static_cast<R>(fault.result);
+    }
+    static void arm(Fault f) {
+        fault = f;
+        calls = 0;
+        zkSystem.*Entry = &call;
+    }
+};
+
+using Arm = void (*)(Fault);
+#define ZK_FAULTY(entry) &Faulty<&zkSystemCalls::entry>::arm
+
+// One call made to misbehave.
+struct Step {
+    Arm arm;
+    Fault fault;
+};
+
+const Step kRenameRefused = {ZK_FAULTY(rename), {0, -1, EACCES}};  // the directory admits no new file
+
+struct Row {
+    const char* name;
+    Step steps[3];
+    int errorSeen;  // 0: the replace succeeds
+};
+
+const Row kRows[] = {
+    {"open interrupted", {{ZK_FAULTY(open), {1, -1, EINTR}}}, 0},
+    {"temporary name taken", {{ZK_FAULTY(open), {1, -1, EEXIST}}}, 0},
+    {"write interrupted", {{ZK_FAULTY(write), {1, -1, EINTR}}}, 0},
+    {"write fails", {{ZK_FAULTY(write), {1, -1, EIO}}}, EIO},
+    {"write takes nothing", {{ZK_FAULTY(write), {1, 0, 0}}}, EIO},
+    {"owner refused", {{ZK_FAULTY(fchown), {1, -1, EPERM}}}, 0},
+    {"mode refused", {{ZK_FAULTY(fchmod), {1, -1, EIO}}}, EIO},
+    {"flush fails", {{ZK_FAULTY(fsync), {1, -1, EIO}}}, EIO},
+    {"close fails", {{ZK_FAULTY(close), {1, -1, EIO}}}, EIO},
+    {"close interrupted", {{ZK_FAULTY(close), {1, -1, EINTR}}}, 0},
+    {"rename fails", {{ZK_FAULTY(rename), {1, -1, EIO}}}, EIO},
+    {"link unreadable", {{ZK_FAULTY(readlink), {1, -1, EIO}}}, EIO},
+    {"link target too long", {{ZK_FAULTY(readlink), {1, 4096, 0}}}, ENAMETOOLONG},
+    {"in place", {kRenameRefused}, 0},
+    {"in place: open fails", {kRenameRefused, {ZK_FAULTY(open), {2, -1, EIO}}}, EIO},
+    {"in place: read interrupted", {kRenameRefused, {ZK_FAULTY(pread), {1, -1, EINTR}}}, 0},
+    {"in place: read fails", {kRenameRefused, {ZK_FAULTY(pread), {1, -1, EIO}}}, EIO},
+    {"in place: no space to reserve", {kRenameRefused, {ZK_FAULTY(allocate), {1, ENOSPC, 0}}}, ENOSPC},
+    {"in place: reserving unsupported", {kRenameRefused, {ZK_FAULTY(allocate), {1, EOPNOTSUPP, 0}}}, 0},
+    {"in place: write fails", {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}}, EIO},
+    {"in place: cut fails", {kRenameRefused, {ZK_FAULTY(ftruncate), {1, -1, EIO}}}, EIO},
+    {"in place: flush fails", {kRenameRefused, {ZK_FAULTY(fsync), {2, -1, EIO}}}, EIO},
+    {"in place: restore interrupted",
+     {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}, {ZK_FAULTY(pwrite), {1, -1, EINTR}}},
+     EIO},
+};
+
+size_t openDescriptors() {
+    return zkDirEntries("/proc/self/fd").size();
+}
+
+bool writeNew(int fd) {
+    return zkWriteAll(fd, kNew.data(), kNew.size()) == 0;
+}
+
+class FileSystemFault : public ::testing::Test {
+protected:
+    void TearDown() override { zkSystem = kRealCalls; }
+    zkTempDir m_dir;
+};
+
+TEST_F(FileSystemFault, OneFailingCallLeavesTheOldFileWhole) {
+    for (const Row& row : kRows) {
+        SCOPED_TRACE(row.name);
+        const std::string target = m_dir.file("target"), link = m_dir.file("link");
+        ASSERT_TRUE(zkWriteFile(target, kOld));
+        ASSERT_EQ(0, symlink("target", link.c_str()));
+        ASSERT_EQ(0, chmod(target.c_str(), 0640));
+        (void)chown(target.c_str(), static_cast<uid_t>(-1), kOtherGroup);  // where we may
+        struct stat before, after;
+        ASSERT_EQ(0, stat(target.c_str(), &before));
+        const size_t descriptors = openDescriptors();
+        zkSystem = kRealCalls;
+        for (const Step& step : row.steps)
+            if (step.arm != nullptr) step.arm(step.fault);
+        errno = 0;
+        const int result = zkReplaceFile(link.c_str(), 0644, kNew.size(), writeNew);
+        const int error = errno;
+        zkSystem = kRealCalls;
+        const int expected = row.errorSeen;
+        EXPECT_EQ(expected == 0 ? 0 : 1, result);
+        EXPECT_EQ(expected, result == 0 ? 0 : error);
+        EXPECT_EQ(expected == 0 ? kNew : kOld, zkReadFile(target));
+        EXPECT_EQ((std::set<std::string>{"link", "target"}), zkDirEntries(m_dir.path()));
+        EXPECT_EQ(descriptors, openDescriptors());
+        ASSERT_EQ(0, stat(target.c_str(), &after));
+        EXPECT_EQ(before.st_uid, after.st_uid);
+        EXPECT_EQ(before.st_gid, after.st_gid);
+        EXPECT_EQ(0640u, after.st_mode & 07777);
+        unlink(target.c_str());
+        unlink(link.c_str());
+    }
+}
+
+TEST_F(FileSystemFault, FailedNewFileIsRemoved) {
+    const struct {
+        const char* name;
+        Arm arm;
+    } rows[] = {{"flush fails", ZK_FAULTY(fsync)}, {"close fails", ZK_FAULTY(close)}};
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.name);
+        zkSystem = kRealCalls;
+        row.arm({1, -1, EIO});
+        errno = 0;
+        EXPECT_EQ(1, zkCreateNewFile(m_dir.file("new").c_str(), 0644, true, writeNew));
+        EXPECT_EQ(EIO, errno);
+        EXPECT_TRUE(zkDirEntries(m_dir.path()).empty());
+    }
+}
+
+TEST_F(FileSystemFault, DeviceFlushFailureIsReportedButUnsupportedFlushIsNot) {
+    Faulty<&zkSystemCalls::fsync>::arm({1, -1, EINVAL});
+    EXPECT_EQ(0, zkReplaceFile("/dev/null", 0644, 0, writeNew));
+    Faulty<&zkSystemCalls::fsync>::arm({1, -1, EIO});
+    errno = 0;
+    EXPECT_EQ(1, zkReplaceFile("/dev/null", 0644, 0, writeNew));
+    EXPECT_EQ(EIO, errno);
+}
+
+}  // namespace
