@@ -75,6 +75,7 @@ struct Row {
 const Row kRows[] = {
     {"open interrupted", {{ZK_FAULTY(open), {1, -1, EINTR}}}, 0},
     {"temporary name taken", {{ZK_FAULTY(open), {1, -1, EEXIST}}}, 0},
+    {"every temporary name taken", {{ZK_FAULTY(open), {0, -1, EEXIST}}}, EEXIST},
     {"write interrupted", {{ZK_FAULTY(write), {1, -1, EINTR}}}, 0},
     {"write fails", {{ZK_FAULTY(write), {1, -1, EIO}}}, EIO},
     {"write takes nothing", {{ZK_FAULTY(write), {1, 0, 0}}}, EIO},
