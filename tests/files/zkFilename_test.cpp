@@ -1,150 +1,81 @@
-// The platform file layer: zkFilename and the handle functions.
-#include <fcntl.h>
-#include <gtest/gtest.h>
-#include <unistd.h>
+// The platform file layer: zkFilename, the handle functions and zkDirIterator.
+#include <map>
+#include <thread>
+#include <tuple>
 
-#include "support/zkTempDir.h"
-#include "zkFilename.h"
+#include "zkFilesTest.h"
 
+// "path=directory|name|extension|protocol"
 static std::string parts(const zkFilename& f) {
     return std::string(f.GetFullPath()) + "=" + f.GetDirectory() + "|" + f.GetName() + "|" + f.GetExtension() + "|" +
            f.GetProtocol();
 }
 
 // A copy and an assigned name hold the same parts.
-TEST(Filename, SplitsIntoParts) {
-    const char* cases[][2] = {
-        {"/opt/app/bin", "/opt/app/bin=/opt/app/|bin||file"},
-        {"/d/a.tar.gz", "/d/a.tar.gz=/d/|a.tar|gz|file"},
-        {"/u/.profile", "/u/.profile=/u/|.profile||file"},
-        {"..", "..=|..||file"},
-        {"a.", "a.=|a.||file"},
-        {"x/a..b", "x/a..b=x/|a.|b|file"},
-        {"/e/", "/e/=/e/|||file"},
-        {"", "=|||file"},
-        {"HTTP://h/x.y", "HTTP://h/x.y=HTTP://h/|x|y|http"},
-        {"svn+ssh://h/", "svn+ssh://h/=svn+ssh://h/|||svn+ssh"},
-        {"a-b.c://h", "a-b.c://h=a-b.c://|h||a-b.c"},
-        {"/a://b", "/a://b=/a://|b||file"},
-        {"://h", "://h=://|h||file"},
-        {"1a://h", "1a://h=1a://|h||file"},
-        {"a_b://h", "a_b://h=a_b://|h||file"},
-    };
-    for (const auto& c : cases) {
-        SCOPED_TRACE(c[0]);
-        const zkFilename f(c[0]);
-        zkFilename assigned("/old/name.ext");
-        assigned = f;
-        EXPECT_EQ(c[1], parts(f));
-        EXPECT_EQ(c[1], parts(zkFilename(f)));
-        EXPECT_EQ(c[1], parts(assigned));
-    }
-}
-
-TEST(Filename, SettersRebuildThePath) {
+TEST(Filename, PartsOfAPath) {
     using Setter = void (zkFilename::*)(const char*);
-    const struct {
-        const char* path;
-        Setter set;
-        const char* value;
-        const char* parts;
-    } cases[] = {
-        {"/d/a.txt", &zkFilename::SetName, "b", "/d/b.txt=/d/|b|txt|file"},
-        {"/d/a.txt", &zkFilename::SetName, "b.c", "/d/b.c.txt=/d/|b.c|txt|file"},
-        {"/d/a.txt", &zkFilename::SetName, "s/b", "/d/s/b.txt=/d/s/|b|txt|file"},
-        {"a.txt", &zkFilename::SetName, "s/b", "s/b.txt=s/|b|txt|file"},
-        {"HTTP://h/a.txt", &zkFilename::SetName, "b", "HTTP://h/b.txt=HTTP://h/|b|txt|http"},
-        {"/d/a.txt", &zkFilename::SetName, "", "/d/.txt=/d/||txt|file"},
-        {"/d/a.txt", &zkFilename::SetExtension, ".gz", "/d/a.gz=/d/|a|gz|file"},
-        {"/d/a.b.c", &zkFilename::SetExtension, "", "/d/a.b=/d/|a|b|file"},
-        {"x.y", &zkFilename::SetExtension, "", "x=|x||file"},
-        {"/d/a.txt", &zkFilename::SetDirectory, "/x", "/x/a.txt=/x/|a|txt|file"},
-        {"/d/a.txt", &zkFilename::SetDirectory, "", "a.txt=|a|txt|file"},
-        {"/d/a.txt", &zkFilename::SetDirectory, "ftp://h/", "ftp://h/a.txt=ftp://h/|a|txt|ftp"},
-        {"/d/", &zkFilename::SetDirectory, "", "=|||file"},
-    };
-    for (const auto& c : cases) {
-        SCOPED_TRACE(std::string(c.path) + " <- " + c.value);
-        zkFilename f(c.path);
-        (f.*c.set)(c.value);
-        EXPECT_EQ(c.parts, parts(f));
+    const std::map<std::string, Setter> setters = {
+        {"name", &zkFilename::SetName}, {"ext", &zkFilename::SetExtension}, {"dir", &zkFilename::SetDirectory}};
+    for (const auto& row : zkCases("files_names.txt")) {
+        SCOPED_TRACE(testing::PrintToString(row));
+        zkFilename f(row[0].c_str());
+        if (!row[1].empty()) (f.*setters.at(row[1]))(row[2].c_str());
+        EXPECT_EQ(row[3], parts(f));
+        EXPECT_EQ(row[3], parts(zkFilename(f)));
+        EXPECT_EQ(row[3], parts(zkFilename("/old/name.ext") = f));
     }
+    // Parts set directly: a directory without its separator, and a name
+    // holding a directory part of its own.
+    zkFilename direct;
+    zkFilename::Dup(&direct.m_dir, "/d", -1);
+    zkFilename::Dup(&direct.m_fname, "s/b", -1);
+    direct.Rebuild(0, 0, 0, 0, 0);
+    EXPECT_EQ("/d/s/b=/d/s/|b||file", parts(direct));
 }
 
+// GetType follows links; FileExists follows them unless told not to.
 TEST(Filename, TypeOnDisk) {
     zkTempDir dir;
-    ASSERT_TRUE(zkWriteFile(dir.file("f"), "x"));
-    ASSERT_EQ(0, symlink(dir.path().c_str(), dir.file("dl").c_str()));
-    ASSERT_EQ(0, symlink("none", dir.file("dangling").c_str()));
-    const std::pair<std::string, int> types[] = {
-        {dir.file("dl"), 1}, {dir.file("f"), 2}, {"/dev/null", 3}, {dir.file("dangling"), 0}, {dir.file("f/x"), 0}};
-    for (const auto& t : types) EXPECT_EQ(t.second, zkFilename(t.first.c_str()).GetType()) << t.first;
-    // A dangling link exists only when links are not followed.
-    EXPECT_EQ(1, zkFilename(dir.file("dangling").c_str()).FileExists(1));
-    EXPECT_EQ(0, zkFilename(dir.file("dangling").c_str()).FileExists(0));
-    EXPECT_EQ(0, zkFilename(dir.file("none").c_str()).FileExists(1));
+    zkPlant(dir.path(), "f=x dl->. dangling->none");
+    // path, GetType, FileExists(1), FileExists(0)
+    const std::tuple<std::string, int, int, int> cases[] = {{dir.file("dl"), 1, 1, 1},  {dir.file("f"), 2, 1, 1},
+                                                            {"/dev/null", 3, 1, 1},     {dir.file("dangling"), 0, 1, 0},
+                                                            {dir.file("f/x"), 0, 0, 0}, {dir.file("none"), 0, 0, 0}};
+    for (const auto& [path, type, exists, existsFollowed] : cases) {
+        SCOPED_TRACE(path);
+        EXPECT_EQ(type, zkFilename(path.c_str()).GetType());
+        EXPECT_EQ(exists, zkFilename(path.c_str()).FileExists(1));
+        EXPECT_EQ(existsFollowed, zkFilename(path.c_str()).FileExists(0));
+    }
 }
 
-TEST(HandleFiles, CreateFileGivesACloseOnExecHandle) {
+// Each call on a closed handle fails: -1, 0 and, for a size, all ones.
+TEST(HandleFiles, ResultsOfEachCall) {
     zkTempDir dir;
-    const int out = CreateFile(dir.file("h").c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr);
+    const std::string path = dir.file("h");
+    const int out = CreateFile(path.c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr);
     EXPECT_EQ(FD_CLOEXEC, fcntl(out, F_GETFD) & FD_CLOEXEC);
-    EXPECT_EQ(-1, CreateFile(dir.file("h").c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr));
+    EXPECT_EQ(-1, CreateFile(path.c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr));
+    EXPECT_EQ(-1, CreateFile(nullptr, O_RDONLY, 0, 0, 0, 0, nullptr));
+    unsigned done = 99, high = 99;
+    EXPECT_EQ(1, WriteFile(out, "a", 1, &done, nullptr));
     EXPECT_EQ(1, CloseHandle(out));
     EXPECT_EQ(0, CloseHandle(out));
-    EXPECT_EQ(-1, CreateFile(nullptr, O_RDONLY, 0, 0, 0, 0, nullptr));
-}
 
-TEST(HandleFiles, ReadFileSaysHowMuchItRead) {
-    zkTempDir dir;
-    ASSERT_TRUE(zkWriteFile(dir.file("r"), "abc"));
-    const int in = CreateFile(dir.file("r").c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
+    const int in = CreateFile(path.c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
     char buffer[8];
-    unsigned done = 99;
     EXPECT_EQ(1, ReadFile(in, buffer, sizeof buffer, &done, nullptr));
-    EXPECT_EQ(3u, done);
+    EXPECT_EQ(1u, done);
     EXPECT_EQ(1, ReadFile(in, buffer, sizeof buffer, &done, nullptr));  // the end
     EXPECT_EQ(0u, done);
+    // A size past 4 GiB comes as its low word, the high word apart.
+    ASSERT_EQ(0, truncate(path.c_str(), (5ll << 30) + 3));
+    EXPECT_EQ((1u << 30) + 3, GetFileSize(in, &high));
+    EXPECT_EQ(1u, high);
     CloseHandle(in);
     done = 99;
     EXPECT_EQ(0, ReadFile(in, buffer, sizeof buffer, &done, nullptr));
     EXPECT_EQ(0u, done);
-}
-
-// Names in byte order; a copy goes on from the same name on its own.
-TEST(DirIterator, ListsMatchingNamesInOrder) {
-    zkTempDir dir;
-    for (const char* name : {"b", "a*", "ab", "c"}) ASSERT_TRUE(zkWriteFile(dir.file(name), ""));
-    EXPECT_EQ(nullptr, zkDirIterator((dir.path() + "/x*").c_str()).GetName());
-    EXPECT_STREQ("a*", zkDirIterator((dir.path() + "/a\\*").c_str()).GetName());
-    zkDirIterator it((dir.path() + "/[a-c]*").c_str()), assigned;
-    ++it;
-    zkDirIterator copy(it);
-    assigned = it;
-    assigned = assigned;
-    EXPECT_TRUE(copy == it);  // the same name in another buffer
-    EXPECT_FALSE(++zkDirIterator(it) == it);
-    EXPECT_STREQ("dev", zkDirIterator("/dev").GetName());  // a directory part of "/"
-    std::string names;
-    for (; copy != zkDirIterator(); ++copy, ++assigned) {
-        EXPECT_STREQ(copy.GetName(), assigned.GetName());
-        names += std::string(copy.GetName()) + " ";
-    }
-    EXPECT_TRUE(assigned == zkDirIterator());
-    EXPECT_EQ("ab b c ", names);
-    EXPECT_STREQ("ab", it.GetName());
-    EXPECT_FALSE(it == zkDirIterator());
-}
-
-TEST(HandleFiles, GetFileSizeGivesTheHighWordApart) {
-    zkTempDir dir;
-    ASSERT_TRUE(zkWriteFile(dir.file("h"), ""));
-    ASSERT_EQ(0, truncate(dir.file("h").c_str(), (5ll << 30) + 3));
-    const int in = CreateFile(dir.file("h").c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
-    unsigned high = 99;
-    EXPECT_EQ((1u << 30) + 3, GetFileSize(in, &high));
-    EXPECT_EQ(1u, high);
-    CloseHandle(in);
     EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, &high));
     EXPECT_EQ(0xFFFFFFFFu, high);
     EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, nullptr));
@@ -162,4 +93,68 @@ TEST(HandleFiles, WriteFileGoesOnAfterShortWrites) {
               }));
     EXPECT_EQ(1, result);
     EXPECT_EQ(data.size(), done);
+}
+
+// A call interrupted before it moved a byte is made again: a read of an
+// empty pipe, then a write to a full one.
+TEST(HandleFiles, InterruptedCallsAreMadeAgain) {
+    if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking call as the kernel does";
+    struct sigaction action = {}, saved;
+    action.sa_handler = [](int) {};  // without SA_RESTART
+    int ends[2];
+    ASSERT_EQ(0, sigaction(SIGUSR1, &action, &saved));
+    ASSERT_EQ(0, pipe2(ends, O_CLOEXEC));
+    const std::string fill(static_cast<size_t>(fcntl(ends[1], F_GETPIPE_SZ)), 'f');
+    const pthread_t caller = pthread_self();
+    // The pauses let the caller block before each signal and the next step.
+    std::thread other([&] {
+        std::string drained(fill.size(), '\0');
+        usleep(50000);
+        pthread_kill(caller, SIGUSR1);
+        usleep(50000);
+        EXPECT_EQ(1, write(ends[1], "x", 1));
+        usleep(100000);
+        pthread_kill(caller, SIGUSR1);
+        usleep(50000);
+        EXPECT_LT(0, read(ends[0], &drained[0], drained.size()));
+    });
+    char byte = 0;
+    unsigned done = 0;
+    EXPECT_EQ(1, ReadFile(ends[0], &byte, 1, &done, nullptr));
+    EXPECT_EQ(1u, done);
+    EXPECT_EQ(static_cast<ssize_t>(fill.size()), write(ends[1], fill.data(), fill.size()));
+    EXPECT_EQ(1, WriteFile(ends[1], "y", 1, &done, nullptr));
+    other.join();
+    close(ends[0]);
+    close(ends[1]);
+    sigaction(SIGUSR1, &saved, nullptr);
+}
+
+// Names in byte order; a copy goes on from the same name on its own. The
+// directory is read once and closed.
+TEST(DirIterator, ListsMatchingNamesInOrder) {
+    zkTempDir dir;
+    zkPlant(dir.path(), "b= a*= ab= c=");
+    const int next = dup(0);  // the lowest free descriptor, which the iterator takes while reading
+    close(next);
+    EXPECT_EQ(nullptr, zkDirIterator((dir.path() + "/x*").c_str()).GetName());
+    EXPECT_EQ(-1, fcntl(next, F_GETFD));
+    EXPECT_STREQ("a*", zkDirIterator((dir.path() + "/a\\*").c_str()).GetName());
+    EXPECT_STREQ("dev", zkDirIterator("/dev").GetName());  // a directory part of "/"
+    zkDirIterator it((dir.path() + "/[a-c]*").c_str()), assigned;
+    ++it;
+    zkDirIterator copy(it);
+    assigned = it;
+    assigned = assigned;
+    EXPECT_TRUE(copy == it);  // the same name in another buffer
+    EXPECT_FALSE(++zkDirIterator(it) == it);
+    std::string names;
+    for (; copy != zkDirIterator(); ++copy, ++assigned) {
+        EXPECT_STREQ(copy.GetName(), assigned.GetName());
+        names += std::string(copy.GetName()) + " ";
+    }
+    EXPECT_TRUE(assigned == zkDirIterator());
+    EXPECT_EQ("ab b c ", names);
+    EXPECT_STREQ("ab", it.GetName());
+    EXPECT_FALSE(it == zkDirIterator());
 }
