@@ -58,6 +58,24 @@ TEST(BasicFile, ResultsOfEachCall) {
     EXPECT_EQ(zkBasicFile::kBadPosition, closed.SetFilePointer(0, zkBasicFile::SeekBegin));
     EXPECT_EQ(zkBasicFile::kBadPosition, closed.GetSize());
     EXPECT_EQ("headbc" + more, zkText(text));
+
+    // A write that fails gives 1 and a count of all ones; one cut short by
+    // the file size limit gives 0 and the count written.
+    zkBasicFile full("/dev/full", 0, O_WRONLY, 0), limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
+    ASSERT_EQ(0, full.Open());
+    EXPECT_EQ(1, full.Write("abc", 3, &count));
+    EXPECT_EQ(static_cast<unsigned long>(-1), count);
+    ASSERT_EQ(0, limited.Open());
+    int first = 1, second = 0;
+    ASSERT_TRUE(zkWithFileSizeLimit(2, [&] {
+        first = limited.Write("abc", 3, &count);
+        second = limited.Write("d", 1, nullptr);
+    }));
+    EXPECT_EQ(0, first);
+    EXPECT_EQ(2u, count);
+    EXPECT_EQ(1, second);
+    EXPECT_EQ(0, limited.Close());
+    EXPECT_EQ("ab", zkReadFile(dir.file("limited")));
 }
 
 TEST(BasicFile, PositionsPast4GiB) {
@@ -75,26 +93,4 @@ TEST(BasicFile, PositionsPast4GiB) {
     EXPECT_EQ(size - 5, file.SetFilePointer(size - 5, zkBasicFile::SeekBegin));
     EXPECT_EQ(0, file.ReadAll(text));
     EXPECT_EQ(std::string("keep") + std::string(5, '\0'), zkText(text));
-}
-
-// A write that fails gives 1 and a count of all ones; one cut short by the
-// file size limit gives 0 and the count written.
-TEST(BasicFile, FailedWritesGiveFailureResults) {
-    zkTempDir dir;
-    unsigned long count = 0;
-    zkBasicFile full("/dev/full", 0, O_WRONLY, 0), limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
-    ASSERT_EQ(0, full.Open());
-    EXPECT_EQ(1, full.Write("abc", 3, &count));
-    EXPECT_EQ(static_cast<unsigned long>(-1), count);
-    ASSERT_EQ(0, limited.Open());
-    int first = 1, second = 0;
-    ASSERT_TRUE(zkWithFileSizeLimit(2, [&] {
-        first = limited.Write("abc", 3, &count);
-        second = limited.Write("d", 1, nullptr);
-    }));
-    EXPECT_EQ(0, first);
-    EXPECT_EQ(2u, count);
-    EXPECT_EQ(1, second);
-    EXPECT_EQ(0, limited.Close());
-    EXPECT_EQ("ab", zkReadFile(dir.file("limited")));
 }

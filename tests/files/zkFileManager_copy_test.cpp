@@ -11,45 +11,20 @@ static int copyFile(const std::string& from, const std::string& to, unsigned rec
     return zkFileManager::CopyFile(source, target, recursive, makeDir, overwrite, symLink, deleteSource, 0, 0);
 }
 
-// Runs the steps of tests/data/<name> in a new temporary directory, which is
-// the current directory meanwhile. "plant ENTRIES" makes entries as zkPlant
-// does; any other step is a copy: FROM TO FLAGS RESULT, then a directory and
-// its entries afterwards as zkTree writes them. FLAGS holds r (recursive), o
-// (overwrite), d (delete the source), m (make the directory), s (link).
-static void copySteps(const std::string& name) {
-    zkTempDir dir;
-    const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    ASSERT_EQ(0, chdir(dir.path().c_str()));
-    for (const auto& row : zkCases(name)) {
-        SCOPED_TRACE(testing::PrintToString(row));
-        std::string rest;
-        for (size_t i = row[0] == "plant" ? 1 : 5; i < row.size(); ++i) rest += row[i] + " ";
-        if (row[0] == "plant") {
-            zkPlant(".", rest);
-            continue;
-        }
-        const auto flag = [&](char c) { return row[2].find(c) != std::string::npos ? 1u : 0u; };
-        EXPECT_EQ(std::stoi(row[3]), copyFile(row[0], row[1], flag('r'), flag('o'), flag('d'), flag('m'), flag('s')));
-        EXPECT_EQ(rest, zkTree(row[4]));
-    }
-    EXPECT_EQ(0, fchdir(home));
-    close(home);
-}
-
 TEST(FileManagerCopy, SingleFile) {
-    copySteps("files_copy_single.txt");
+    zkRunSteps("files_copy_single.txt");
 }
 
 TEST(FileManagerCopy, RefusedCopies) {
-    copySteps("files_copy_refused.txt");
+    zkRunSteps("files_copy_refused.txt");
 }
 
 TEST(FileManagerCopy, DirectoryCopies) {
-    copySteps("files_copy_tree.txt");
+    zkRunSteps("files_copy_tree.txt");
 }
 
 TEST(FileManagerCopy, SymbolicLinkInsteadOfACopy) {
-    copySteps("files_copy_links.txt");
+    zkRunSteps("files_copy_links.txt");
 }
 
 // A new copy is never more open than its source, also when it could have

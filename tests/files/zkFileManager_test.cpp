@@ -2,11 +2,7 @@
 // lists, and file records.
 #include <sys/statfs.h>
 
-#include <algorithm>
-
 #include "zkFilesTest.h"
-
-using Names = std::multiset<std::string>;
 
 static std::string joined(const char* dir, const char* name, unsigned noTrailing) {
     zkStringBase result("stale");
@@ -15,29 +11,26 @@ static std::string joined(const char* dir, const char* name, unsigned noTrailing
 }
 
 // The four-string form appends the file unexamined; the result may be the
-// same string as any argument.
+// same string as any argument. Backslashes become the chosen separator,
+// or '/' when asked.
 TEST(MakePath, JoinsDirectoryAndName) {
     for (const auto& row : zkCases("files_makepath.txt")) {
         SCOPED_TRACE(testing::PrintToString(row));
-        EXPECT_EQ(row[3], joined(row[0].c_str(), row[1].c_str(), std::stoul(row[2])));
+        zkFileManager::m_slash = row.size() > 4 ? row[4][0] : '/';
+        const std::string path = joined(row[0].c_str(), row[1].c_str(), std::stoul(row[2]));
+        zkFileManager::m_slash = '/';
+        EXPECT_EQ(row[3], path);
     }
-    zkStringBase dir("/a"), name("b"), file("\\a\\..\\b");
+    zkStringBase dir("/a"), name("b"), file("\\a\\..\\b"), mixed("a\\b/c");
     zkFileManager::MakePath(dir, dir, name, 1u);
     EXPECT_EQ("/a/b", zkText(dir));
     zkFileManager::MakePath(name, dir, name, 1u);
     EXPECT_EQ("/a/b/b", zkText(name));
     zkFileManager::MakePath(file, zkStr("/d/s"), zkStr("../../x"), file);
     EXPECT_EQ("/x/a\\..\\b", zkText(file));
-}
-
-TEST(MakePath, InsertsTheChosenSeparator) {
     zkFileManager::m_slash = '\\';
-    zkStringBase mixed("a\\b/c");
     zkFileManager::TranslatePathSeparators(mixed, 0);
-    const std::string windows = joined("C:/a", "b", 0), root = joined("", "..", 1);
     zkFileManager::m_slash = '/';
-    EXPECT_EQ("C:/a\\b\\", windows);
-    EXPECT_EQ("\\", root);
     EXPECT_EQ("a/b/c", zkText(mixed));
 }
 
@@ -47,16 +40,12 @@ static std::string current(void (*get)(zkStringBase&)) {
     return zkText(path);
 }
 
+TEST(FileManagerDirs, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
+    zkRunSteps("files_mkdir.txt");
+}
+
 TEST(FileManagerDirs, DeleteFileRemovesADirectoryOnlyWithTheFlag) {
-    zkTempDir dir;
-    zkPlant(dir.path(), "d/ link->d");
-    zkStringBase sub(dir.file("d").c_str());
-    zkFilename link(dir.file("link").c_str());
-    EXPECT_EQ(0, zkFileManager::DeleteFile(sub, 0));
-    EXPECT_EQ(1, zkFileManager::DeleteFile(link, 0));
-    EXPECT_EQ(1, zkFileManager::DeleteFile(sub, 1));
-    EXPECT_EQ(0, zkFileManager::DeleteFile(sub, 1));
-    EXPECT_EQ(0, zkUnlink(nullptr, 0));
+    zkRunSteps("files_delete.txt");
 }
 
 TEST(FileManagerDirs, DirectoryNamesOfAnyLength) {
@@ -92,73 +81,8 @@ TEST(FileManagerDirs, FreeDiskSpaceIsBlockSizeTimesAvailableBlocks) {
     EXPECT_EQ(static_cast<long long>(static_cast<unsigned long long>(before.f_bsize) * before.f_bavail), space);
 }
 
-TEST(FileManagerDirs, CreateDirectoryMakesTheMissingPartsOfAnyPath) {
-    zkTempDir dir;
-    zkPlant(dir.path(), "plain=x");
-    const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    ASSERT_EQ(0, chdir(dir.path().c_str()));
-    EXPECT_NE(0, zkFileManager::CreateDirectory("a//b/c/", nullptr));
-    EXPECT_NE(0, zkFileManager::CreateDirectory("a/b/c", nullptr));  // already there
-    EXPECT_NE(0, zkFileManager::CreateDirectory((dir.path() + "/a/x/y").c_str(), nullptr));
-    EXPECT_EQ(0, zkFileManager::CreateDirectory("plain/a/b", nullptr));
-    EXPECT_EQ(0, zkFileManager::CreateDirectory("", nullptr));
-    EXPECT_EQ(0, zkFileManager::CreateDirectory(nullptr, nullptr));
-    ASSERT_EQ(0, fchdir(home));
-    close(home);
-    EXPECT_EQ("a/ a/b/ a/b/c/ a/x/ a/x/y/ plain=x ", zkTree(dir.path()));
-}
-
-// "path:size" of each record appended after the one already there; readdir
-// has no fixed order.
-static Names files(const std::string& dir, const char* pattern, unsigned fullPaths = 0) {
-    std::list<zkFileInfo> list(1);
-    EXPECT_EQ(0, zkFileManager::GetFileList(dir.c_str(), pattern, list, fullPaths));
-    Names out;
-    for (auto it = std::next(list.begin()); it != list.end(); ++it)
-        out.insert(std::string(it->m_file.GetFullPath()) + ":" + std::to_string(it->m_size));
-    return out;
-}
-
-// The names in list order.
-static std::vector<std::string> folders(const std::string& root, const char* relative, unsigned recursive,
-                                        unsigned fullPaths) {
-    std::list<zkStringBase> list;
-    EXPECT_EQ(0, zkFileManager::GetFolderList(root.c_str(), relative, list, recursive, fullPaths));
-    std::vector<std::string> out;
-    for (const zkStringBase& name : list) out.push_back(name.data());
-    return out;
-}
-
-// Files, folders, links to both and a dangling link, all 5 bytes long.
-static const char* const kTree =
-    "a.txt=a.txt b.txt=b.txt e.TXT=e.TXT notes=notes x.tar.gz=x.tar.gz d.txt/ s/ s/a/ s/a/x/ s/b/ s/.cache/ s/n.txt=n "
-    "link.txt->a.txt dir.txt->d.txt dangling.txt->gone s/a/up->..";
-
-// Files match the last extension exactly; folders come depth first.
 TEST(FileManagerList, ListsTheMatchingEntries) {
-    zkTempDir dir;
-    zkPlant(dir.path(), kTree);
-    // A link is described by its target, or by itself when the target is missing.
-    EXPECT_EQ((Names{"a.txt:5", "b.txt:5", "dangling.txt:4", "link.txt:5"}), files(dir.path(), "*.txt"));
-    EXPECT_EQ((Names{"notes:5"}), files(dir.path(), "plain"));
-    EXPECT_EQ((Names{"n.txt:1"}), files(dir.path(), "s/*.txt"));
-    EXPECT_EQ((Names{dir.file("x.tar.gz:8")}), files(dir.path(), "*.tar.gz", 1));
-    std::list<zkFileInfo> noFiles;
-    EXPECT_EQ(1, zkFileManager::GetFileList(dir.file("none").c_str(), "*.txt", noFiles, 0));
-    EXPECT_TRUE(noFiles.empty());
-
-    const std::vector<std::string> top = folders(dir.file("s/a"), "", 0, 0), full = folders(dir.path(), "s", 0, 1);
-    EXPECT_EQ((Names{"/up/", "/x/"}), Names(top.begin(), top.end()));
-    EXPECT_EQ((Names{dir.file("s/.cache"), dir.file("s/a"), dir.file("s/b")}), Names(full.begin(), full.end()));
-    // s/a/ is followed by its own folders; up leads back to s and is not entered.
-    const std::vector<std::string> deep = folders(dir.path(), "s", 1, 0);
-    EXPECT_EQ((Names{"s/.cache/", "s/a/", "s/a/up/", "s/a/x/", "s/b/"}), Names(deep.begin(), deep.end()));
-    const auto below = std::find(deep.begin(), deep.end(), "s/a/") + 1;
-    ASSERT_LE(below + 2, deep.end());
-    EXPECT_EQ((Names{"s/a/up/", "s/a/x/"}), Names(below, below + 2));
-    std::list<zkStringBase> noFolders;
-    EXPECT_EQ(1, zkFileManager::GetFolderList(dir.path().c_str(), "none", noFolders, 1, 0));
-    EXPECT_TRUE(noFolders.empty());
+    zkRunSteps("files_lists.txt");
 }
 
 TEST(FileInfo, GetFileInfoFillsTheRecordOnlyOnSuccess) {
