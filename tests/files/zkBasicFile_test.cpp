@@ -1,5 +1,6 @@
 // zkBasicFile: results, ReadAll, 64-bit positions, long names.
 #include <cerrno>
+#include <cstring>
 #include <memory>
 
 #include "zkFilesTest.h"
@@ -27,7 +28,11 @@ TEST(BasicFile, ResultsOfEachCall) {
 
     // A directory opens for reading, but reading it fails.
     zkBasicFile directory(dir.path().c_str(), 0, O_RDONLY, 0);
+    char buffer[4];
+    unsigned long count = 99;
     ASSERT_EQ(0, directory.Open());
+    EXPECT_EQ(1, directory.Read(buffer, sizeof buffer, &count));
+    EXPECT_EQ(0u, count);
     EXPECT_EQ(1, directory.ReadAll(text));
     EXPECT_EQ(EISDIR, errno);
     EXPECT_EQ("headbc" + more, zkText(text));
@@ -43,26 +48,41 @@ TEST(BasicFile, ResultsOfEachCall) {
     EXPECT_EQ(0, longName.Sync());
     EXPECT_EQ(zkBasicFile::kBadPosition, longName.SetFilePointer(~0ull, zkBasicFile::SeekBegin));
 
-    // A file never opened, or whose name was taken back, fails every call
-    // and leaves the string alone.
-    EXPECT_EQ(1, zkBasicFile().Close());
+    // A new object has no name and is closed, whatever its bytes held
+    // before: every call fails, leaving the count and the string alone and
+    // trying no read. Its flags are O_CREAT and O_RDWR.
+    alignas(zkBasicFile) unsigned char raw[sizeof(zkBasicFile)];
+    std::memset(raw, 'q', sizeof raw);
+    zkBasicFile& fresh = *new (raw) zkBasicFile;
+    count = 99;
+    EXPECT_EQ(1, fresh.Close());
+    EXPECT_EQ(1, fresh.Open());
+    EXPECT_EQ(1, fresh.Read(buffer, sizeof buffer, &count));
+    EXPECT_EQ(1, fresh.Write("abc", 3, &count));
+    EXPECT_EQ(99u, count);
+    errno = EINTR;
+    EXPECT_EQ(1, fresh.ReadAll(text));
+    EXPECT_EQ(1, fresh.Sync());
+    EXPECT_EQ(zkBasicFile::kBadPosition, fresh.SetFilePointer(0, zkBasicFile::SeekBegin));
+    EXPECT_EQ(zkBasicFile::kBadPosition, fresh.GetSize());
+    EXPECT_EQ("headbc" + more, zkText(text));
+    fresh.SetFilename(dir.file("made").c_str());
+    EXPECT_EQ(0, fresh.Open());
+    EXPECT_EQ(0, fresh.Write("", 0, nullptr));  // nothing to write is no failure
+    EXPECT_EQ(0, fresh.Write("m", 1, nullptr));
+    EXPECT_EQ(0, fresh.Close());
+    EXPECT_EQ(1, fresh.Close());
+    fresh.~zkBasicFile();
+    // A name taken back is the empty name.
     zkBasicFile closed(".", 0, O_RDONLY, 0);
-    char buffer[4];
-    unsigned long count = 0;
     closed.SetFilename(nullptr);
     EXPECT_EQ(1, closed.Open());
-    EXPECT_EQ(1, closed.Read(buffer, sizeof buffer, &count));
-    EXPECT_EQ(1, closed.Write("abc", 3, &count));
-    EXPECT_EQ(1, closed.ReadAll(text));
-    EXPECT_EQ(1, closed.Sync());
-    EXPECT_EQ(zkBasicFile::kBadPosition, closed.SetFilePointer(0, zkBasicFile::SeekBegin));
-    EXPECT_EQ(zkBasicFile::kBadPosition, closed.GetSize());
-    EXPECT_EQ("headbc" + more, zkText(text));
 
     // A write that fails gives 1 and a count of all ones; one cut short by
     // the file size limit gives 0 and the count written.
     zkBasicFile full("/dev/full", 0, O_WRONLY, 0), limited(dir.file("limited").c_str(), O_CREAT, O_WRONLY, 0);
     ASSERT_EQ(0, full.Open());
+    EXPECT_EQ(1, full.Sync());  // a device that cannot be flushed
     EXPECT_EQ(1, full.Write("abc", 3, &count));
     EXPECT_EQ(static_cast<unsigned long>(-1), count);
     ASSERT_EQ(0, limited.Open());

@@ -4,22 +4,17 @@
 
 #include "zkFilesTest.h"
 
-static std::string joined(const char* dir, const char* name, unsigned noTrailing) {
-    zkStringBase result("stale");
-    zkFileManager::MakePath(result, zkStr(dir), zkStr(name), noTrailing);
-    return zkText(result);
-}
-
 // The four-string form appends the file unexamined; the result may be the
 // same string as any argument. Backslashes become the chosen separator,
 // or '/' when asked.
 TEST(MakePath, JoinsDirectoryAndName) {
     for (const auto& row : zkCases("files_makepath.txt")) {
         SCOPED_TRACE(testing::PrintToString(row));
+        zkStringBase path("stale");
         zkFileManager::m_slash = row.size() > 4 ? row[4][0] : '/';
-        const std::string path = joined(row[0].c_str(), row[1].c_str(), std::stoul(row[2]));
+        zkFileManager::MakePath(path, zkStr(row[0]), zkStr(row[1]), std::stoul(row[2]));
         zkFileManager::m_slash = '/';
-        EXPECT_EQ(row[3], path);
+        EXPECT_EQ(row[3], zkText(path));
     }
     zkStringBase dir("/a"), name("b"), file("\\a\\..\\b"), mixed("a\\b/c");
     zkFileManager::MakePath(dir, dir, name, 1u);
@@ -48,10 +43,14 @@ TEST(FileManagerDirs, DeleteFileRemovesADirectoryOnlyWithTheFlag) {
     zkRunSteps("files_delete.txt");
 }
 
+// The module directory ends with the chosen separator.
 TEST(FileManagerDirs, DirectoryNamesOfAnyLength) {
     const std::string saved = current(zkFileManager::GetCurrentDirectory);
     ASSERT_EQ(0, chdir("/"));
-    EXPECT_EQ("/", current(zkFileManager::GetModuleDirectory));
+    zkFileManager::m_slash = '\\';
+    const std::string root = current(zkFileManager::GetModuleDirectory);
+    zkFileManager::m_slash = '/';
+    EXPECT_EQ("/\\", root);
     zkTempDir dir;
     ASSERT_EQ(0, chdir(dir.path().c_str()));
     std::string deep = current(zkFileManager::GetCurrentDirectory);
@@ -85,6 +84,13 @@ TEST(FileManagerList, ListsTheMatchingEntries) {
     zkRunSteps("files_lists.txt");
 }
 
+// "path size ctime atime mtime mode" of a record.
+static std::string record(const zkFileInfo& r) {
+    return std::string(r.m_file.GetFullPath()) + " " + std::to_string(r.m_size) + " " + std::to_string(r.m_ctime) +
+           " " + std::to_string(r.m_atime) + " " + std::to_string(r.m_mtime) + " " + std::to_string(r.m_mode);
+}
+
+// A new record is empty; one made from a file takes its name and extension.
 TEST(FileInfo, GetFileInfoFillsTheRecordOnlyOnSuccess) {
     zkTempDir dir;
     const std::string path = dir.file("a.b.txt");
@@ -95,6 +101,8 @@ TEST(FileInfo, GetFileInfoFillsTheRecordOnlyOnSuccess) {
     ASSERT_EQ(0, truncate(path.c_str(), 5ll << 30));
     ASSERT_EQ(0, utimensat(AT_FDCWD, path.c_str(), times, 0));
 
+    EXPECT_EQ(" 0 0 0 0 0", record(zkFileInfo()));
+    EXPECT_STREQ("a.b.txt", zkFileInfo(zkFilename(path.c_str())).m_file.GetFullPath());
     zkFileInfo info;
     info.m_file.SetDirectory("/keep/");
     info.m_size = 42u;

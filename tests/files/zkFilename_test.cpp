@@ -1,6 +1,5 @@
 // The platform file layer: zkFilename, the handle functions and zkDirIterator.
 #include <map>
-#include <tuple>
 
 #include "zkFilesTest.h"
 

@@ -93,6 +93,12 @@ inline void zkStep(const zkRow& row) {
     } else if (row[0] == "copy") {
         EXPECT_EQ(number(4), zkFileManager::CopyFile(first, second, flag('r'), flag('m'), flag('o'), flag('s'),
                                                      flag('d'), nullptr, nullptr));
+    } else if (row[0] == "chmod") {
+        EXPECT_EQ(0, chmod(row[1].c_str(), static_cast<mode_t>(std::stoi(row.at(2), nullptr, 8))));
+    } else if (row[0] == "mode") {
+        struct stat st = {};
+        EXPECT_EQ(0, stat(row[1].c_str(), &st));
+        EXPECT_EQ(std::stoi(row.at(2), nullptr, 8), static_cast<int>(st.st_mode & 07777));
     } else if (row[0] == "mkdir") {
         EXPECT_EQ(number(2), zkFileManager::CreateDirectory(row[1].c_str(), nullptr) != 0 ? 1 : 0);
     } else if (row[0] == "delete") {
@@ -134,6 +140,8 @@ inline void zkStep(const zkRow& row) {
 //   copy FROM TO FLAGS RESULT CopyFile with FLAGS of r (recursive), o
 //                             (overwrite), d (delete the source), m (make the
 //                             directory) and s (link instead of a copy)
+//   chmod PATH MODE           sets the mode (octal); the umask is 0 meanwhile
+//   mode PATH MODE            the permission bits of PATH are MODE (octal)
 //   mkdir PATH RESULT         CreateDirectory, RESULT 1 when made
 //   delete PATH FLAG RESULT   DeleteFile of the path as a string, and
 //   delete-name ...           of the path as a zkFilename
@@ -145,13 +153,18 @@ inline void zkStep(const zkRow& row) {
 inline void zkRunSteps(const std::string& name) {
     zkTempDir dir;
     const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    const mode_t mask = umask(0);
     ASSERT_EQ(0, chdir(dir.path().c_str()));
     for (const zkRow& row : zkCases(name)) {
         SCOPED_TRACE(testing::PrintToString(row));
+        const int next = dup(0);  // the lowest free descriptor, free again after each step
+        close(next);
         zkStep(row);
+        EXPECT_EQ(-1, fcntl(next, F_GETFD)) << "a descriptor was left open";
     }
     EXPECT_EQ(0, fchdir(home));
     close(home);
+    umask(mask);
 }
 
 #endif
