@@ -71,8 +71,9 @@ TEST(HandleFiles, ResultsOfEachCall) {
 // made again, and each write cut short goes on from where it stopped.
 TEST(HandleFiles, InterruptedCallsGoOn) {
     if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking call as the kernel does";
-    static int ends[2], signals = 0;
+    static int ends[2], signals;
     static char block[1 << 16];
+    signals = 0;
     // Without SA_RESTART. The first signal gives the waiting read its byte,
     // the second makes room for the waiting write.
     struct sigaction action = {}, saved;

@@ -153,8 +153,8 @@ inline void zkStep(const zkRow& row) {
 inline void zkRunSteps(const std::string& name) {
     zkTempDir dir;
     const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    const mode_t mask = umask(0);
     ASSERT_EQ(0, chdir(dir.path().c_str()));
+    const mode_t mask = umask(0);
     for (const zkRow& row : zkCases(name)) {
         SCOPED_TRACE(testing::PrintToString(row));
         const int next = dup(0);  // the lowest free descriptor, free again after each step
