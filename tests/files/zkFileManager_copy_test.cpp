@@ -2,6 +2,8 @@
 // which a copy could lose data.
 #include <sys/mman.h>
 
+#include <utility>
+
 #include "zkFilesTest.h"
 
 // Arguments in the order of CopyFile without makeDir and symLink, which come last.
@@ -78,17 +80,14 @@ TEST(FileManagerCopy, FileSizeLimitAtEveryOffsetLeavesNoPartialFile) {
 TEST(FileManagerCopy, TreesPastThePathLimit) {
     zkTempDir dir;
     const std::string top = dir.file("deep");
-    std::string relative = "/", full = top;
+    std::string full = top;
     ASSERT_EQ(0, mkdir(top.c_str(), 0755));
     int fd = open(top.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     size_t count = 0;
     for (size_t left = 4095 - top.size(); left != 0; left = 4095 - full.size()) {
         const std::string name(left > 256 ? 200 : left - 1, static_cast<char>('a' + count++));
         ASSERT_EQ(0, mkdirat(fd, name.c_str(), 0755)) << name;
-        const int next = openat(fd, name.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-        close(fd);
-        fd = next;
-        relative += name + "/";
+        close(std::exchange(fd, openat(fd, name.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)));  // one level down
         full += "/" + name;
     }
     ASSERT_EQ(0, mkdirat(fd, "d", 0755));
@@ -98,7 +97,7 @@ TEST(FileManagerCopy, TreesPastThePathLimit) {
     EXPECT_EQ(0, zkFileManager::GetFolderList(top.c_str(), "", folders, 1, 0));
     EXPECT_EQ(0, zkFileManager::GetFolderList(top.c_str(), "", fullPaths, 1, 1));
     EXPECT_EQ(count + 1, folders.size());
-    EXPECT_EQ(relative + "d/", folders.back().data());
+    EXPECT_EQ(full.substr(top.size()) + "/d/", folders.back().data());
     EXPECT_EQ(full + "/d", fullPaths.back().data());
     EXPECT_EQ(1, copyFile(top, dir.file("copy"), 1));
 
