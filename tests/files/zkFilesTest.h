@@ -14,11 +14,11 @@
 #include "zkBasicFile.h"
 #include "zkFileManager.h"
 
-// Makes the entries of spec below dir, in order, written as zkTree writes
+// Makes the entries of layout below dir, in order, written as zkTree writes
 // them: "name/" a folder, "name->target" a symbolic link, "name=text" a file;
 // also "name=>other" a hard link to the entry other, and "name|" a FIFO.
-inline void zkPlant(const std::string& dir, const std::string& spec) {
-    std::istringstream entries(spec);
+inline void zkPlant(const std::string& dir, const std::string& layout) {
+    std::istringstream entries(layout);
     for (std::string entry; entries >> entry;) {
         const size_t link = entry.find("->"), hard = entry.find("=>"), text = entry.find('=');
         const std::string path = dir + "/" + entry.substr(0, std::min(link, text));
