@@ -1,122 +1,119 @@
-// The platform file layer: zkFilename and the handle functions.
-#include <fcntl.h>
-#include <gtest/gtest.h>
-#include <unistd.h>
+// The platform file layer: zkFilename, the handle functions and zkDirIterator.
+#include <map>
 
-#include "support/zkTempDir.h"
-#include "zkFilename.h"
+#include "zkFilesTest.h"
 
+// "path=directory|name|extension|protocol"
 static std::string parts(const zkFilename& f) {
     return std::string(f.GetFullPath()) + "=" + f.GetDirectory() + "|" + f.GetName() + "|" + f.GetExtension() + "|" +
            f.GetProtocol();
 }
 
 // A copy and an assigned name hold the same parts.
-TEST(Filename, SplitsIntoParts) {
-    const char* cases[][2] = {
-        {"/opt/app/bin", "/opt/app/bin=/opt/app/|bin||file"},
-        {"/d/a.tar.gz", "/d/a.tar.gz=/d/|a.tar|gz|file"},
-        {"/u/.profile", "/u/.profile=/u/|.profile||file"},
-        {"..", "..=|..||file"},
-        {"a.", "a.=|a.||file"},
-        {"x/a..b", "x/a..b=x/|a.|b|file"},
-        {"/e/", "/e/=/e/|||file"},
-        {"", "=|||file"},
-        {"HTTP://h/x.y", "HTTP://h/x.y=HTTP://h/|x|y|http"},
-        {"svn+ssh://h/", "svn+ssh://h/=svn+ssh://h/|||svn+ssh"},
-        {"a-b.c://h", "a-b.c://h=a-b.c://|h||a-b.c"},
-        {"/a://b", "/a://b=/a://|b||file"},
-        {"://h", "://h=://|h||file"},
-        {"1a://h", "1a://h=1a://|h||file"},
-        {"a_b://h", "a_b://h=a_b://|h||file"},
-    };
-    for (const auto& c : cases) {
-        SCOPED_TRACE(c[0]);
-        const zkFilename f(c[0]);
-        zkFilename assigned("/old/name.ext");
-        assigned = f;
-        EXPECT_EQ(c[1], parts(f));
-        EXPECT_EQ(c[1], parts(zkFilename(f)));
-        EXPECT_EQ(c[1], parts(assigned));
-    }
-}
-
-TEST(Filename, SettersRebuildThePath) {
+TEST(Filename, PartsOfAPath) {
     using Setter = void (zkFilename::*)(const char*);
-    const struct {
-        const char* path;
-        Setter set;
-        const char* value;
-        const char* parts;
-    } cases[] = {
-        {"/d/a.txt", &zkFilename::SetName, "b", "/d/b.txt=/d/|b|txt|file"},
-        {"/d/a.txt", &zkFilename::SetName, "b.c", "/d/b.c.txt=/d/|b.c|txt|file"},
-        {"/d/a.txt", &zkFilename::SetName, "s/b", "/d/s/b.txt=/d/s/|b|txt|file"},
-        {"a.txt", &zkFilename::SetName, "s/b", "s/b.txt=s/|b|txt|file"},
-        {"HTTP://h/a.txt", &zkFilename::SetName, "b", "HTTP://h/b.txt=HTTP://h/|b|txt|http"},
-        {"/d/a.txt", &zkFilename::SetName, "", "/d/.txt=/d/||txt|file"},
-        {"/d/a.txt", &zkFilename::SetExtension, ".gz", "/d/a.gz=/d/|a|gz|file"},
-        {"/d/a.b.c", &zkFilename::SetExtension, "", "/d/a.b=/d/|a|b|file"},
-        {"x.y", &zkFilename::SetExtension, "", "x=|x||file"},
-        {"/d/a.txt", &zkFilename::SetDirectory, "/x", "/x/a.txt=/x/|a|txt|file"},
-        {"/d/a.txt", &zkFilename::SetDirectory, "", "a.txt=|a|txt|file"},
-        {"/d/a.txt", &zkFilename::SetDirectory, "ftp://h/", "ftp://h/a.txt=ftp://h/|a|txt|ftp"},
-        {"/d/", &zkFilename::SetDirectory, "", "=|||file"},
-    };
-    for (const auto& c : cases) {
-        SCOPED_TRACE(std::string(c.path) + " <- " + c.value);
-        zkFilename f(c.path);
-        (f.*c.set)(c.value);
-        EXPECT_EQ(c.parts, parts(f));
+    const std::map<std::string, Setter> setters = {
+        {"name", &zkFilename::SetName}, {"ext", &zkFilename::SetExtension}, {"dir", &zkFilename::SetDirectory}};
+    for (const auto& row : zkCases("files_names.txt")) {
+        SCOPED_TRACE(testing::PrintToString(row));
+        zkFilename f(row[0].c_str());
+        if (!row[1].empty()) (f.*setters.at(row[1]))(row[2].c_str());
+        EXPECT_EQ(row[3], parts(f));
+        EXPECT_EQ(row[3], parts(zkFilename(f)));
+        EXPECT_EQ(row[3], parts(zkFilename("/old/name.ext") = f));
     }
+    // Parts set directly: a directory without its separator, and a name
+    // holding a directory part of its own.
+    zkFilename direct;
+    zkFilename::Dup(&direct.m_dir, "/d", -1);
+    zkFilename::Dup(&direct.m_fname, "s/b", -1);
+    direct.Rebuild(0, 0, 0, 0, 0);
+    EXPECT_EQ("/d/s/b=/d/s/|b||file", parts(direct));
 }
 
 TEST(Filename, TypeOnDisk) {
-    zkTempDir dir;
-    ASSERT_TRUE(zkWriteFile(dir.file("f"), "x"));
-    ASSERT_EQ(0, symlink(dir.path().c_str(), dir.file("dl").c_str()));
-    ASSERT_EQ(0, symlink("none", dir.file("dangling").c_str()));
-    const std::pair<std::string, int> types[] = {
-        {dir.file("dl"), 1}, {dir.file("f"), 2}, {"/dev/null", 3}, {dir.file("dangling"), 0}, {dir.file("f/x"), 0}};
-    for (const auto& t : types) EXPECT_EQ(t.second, zkFilename(t.first.c_str()).GetType()) << t.first;
-    // A dangling link exists only when links are not followed.
-    EXPECT_EQ(1, zkFilename(dir.file("dangling").c_str()).FileExists(1));
-    EXPECT_EQ(0, zkFilename(dir.file("dangling").c_str()).FileExists(0));
-    EXPECT_EQ(0, zkFilename(dir.file("none").c_str()).FileExists(1));
+    zkRunSteps("files_types.txt");
 }
 
-TEST(HandleFiles, CreateFileGivesACloseOnExecHandle) {
+// Each call on a closed handle fails: -1, 0 and, for a size, all ones.
+TEST(HandleFiles, ResultsOfEachCall) {
     zkTempDir dir;
-    const int out = CreateFile(dir.file("h").c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr);
+    const std::string path = dir.file("h");
+    const int out = CreateFile(path.c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr);
     EXPECT_EQ(FD_CLOEXEC, fcntl(out, F_GETFD) & FD_CLOEXEC);
-    EXPECT_EQ(-1, CreateFile(dir.file("h").c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr));
+    EXPECT_EQ(-1, CreateFile(path.c_str(), O_CREAT | O_WRONLY, 0222, 0, O_EXCL, 0664, nullptr));
+    EXPECT_EQ(-1, CreateFile(nullptr, O_RDONLY, 0, 0, 0, 0, nullptr));
+    unsigned done = 99, high = 99;
+    EXPECT_EQ(1, WriteFile(out, "a", 1, &done, nullptr));
     EXPECT_EQ(1, CloseHandle(out));
     EXPECT_EQ(0, CloseHandle(out));
-    EXPECT_EQ(-1, CreateFile(nullptr, O_RDONLY, 0, 0, 0, 0, nullptr));
-}
 
-TEST(HandleFiles, ReadFileSaysHowMuchItRead) {
-    zkTempDir dir;
-    ASSERT_TRUE(zkWriteFile(dir.file("r"), "abc"));
-    const int in = CreateFile(dir.file("r").c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
+    const int in = CreateFile(path.c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
     char buffer[8];
-    unsigned done = 99;
     EXPECT_EQ(1, ReadFile(in, buffer, sizeof buffer, &done, nullptr));
-    EXPECT_EQ(3u, done);
+    EXPECT_EQ(1u, done);
     EXPECT_EQ(1, ReadFile(in, buffer, sizeof buffer, &done, nullptr));  // the end
     EXPECT_EQ(0u, done);
+    // A size past 4 GiB comes as its low word, the high word apart.
+    ASSERT_EQ(0, truncate(path.c_str(), (5ll << 30) + 3));
+    EXPECT_EQ((1u << 30) + 3, GetFileSize(in, &high));
+    EXPECT_EQ(1u, high);
     CloseHandle(in);
     done = 99;
     EXPECT_EQ(0, ReadFile(in, buffer, sizeof buffer, &done, nullptr));
     EXPECT_EQ(0u, done);
+    EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, &high));
+    EXPECT_EQ(0xFFFFFFFFu, high);
+    EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, nullptr));
 }
 
-// Names in byte order; a copy goes on from the same name on its own.
+// An interrupted call goes on: one interrupted before it moved a byte is
+// made again, and each write cut short goes on from where it stopped.
+TEST(HandleFiles, InterruptedCallsGoOn) {
+    if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking call as the kernel does";
+    static int ends[2], signals;
+    static char block[1 << 16];
+    signals = 0;
+    // Without SA_RESTART. The first signal gives the waiting read its byte,
+    // the second makes room for the waiting write.
+    struct sigaction action = {}, saved;
+    action.sa_handler = [](int) { (void)!(signals++ ? read(ends[0], block, sizeof block) : write(ends[1], "x", 1)); };
+    ASSERT_EQ(0, sigaction(SIGALRM, &action, &saved));
+    ASSERT_EQ(0, pipe2(ends, O_CLOEXEC));
+    char byte = 0;
+    unsigned done = 0;
+    ualarm(50000, 0);
+    ASSERT_EQ(1, ReadFile(ends[0], &byte, 1, &done, nullptr));
+    EXPECT_EQ(1u, done);
+    const std::string fill(static_cast<size_t>(fcntl(ends[1], F_GETPIPE_SZ)), 'f');
+    EXPECT_EQ(static_cast<ssize_t>(fill.size()), write(ends[1], fill.data(), fill.size()));
+    ualarm(50000, 0);
+    EXPECT_EQ(1, WriteFile(ends[1], "y", 1, &done, nullptr));
+    close(ends[0]);
+    close(ends[1]);
+    sigaction(SIGALRM, &saved, nullptr);
+
+    std::string data((1 << 19) + 1000, '\0');  // not a whole number of blocks
+    for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
+    int result = 0;
+    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) {
+                  result = WriteFile(fd, data.data(), static_cast<unsigned>(data.size()), &done, nullptr);
+              }));
+    EXPECT_EQ(1, result);
+    EXPECT_EQ(data.size(), done);
+}
+
+// Names in byte order; a copy goes on from the same name on its own. The
+// directory is read once and closed.
 TEST(DirIterator, ListsMatchingNamesInOrder) {
     zkTempDir dir;
-    for (const char* name : {"b", "a*", "ab", "c"}) ASSERT_TRUE(zkWriteFile(dir.file(name), ""));
+    zkPlant(dir.path(), "b= a*= ab= c=");
+    const int next = dup(0);  // the lowest free descriptor, which the iterator takes while reading
+    close(next);
     EXPECT_EQ(nullptr, zkDirIterator((dir.path() + "/x*").c_str()).GetName());
+    EXPECT_EQ(-1, fcntl(next, F_GETFD));
     EXPECT_STREQ("a*", zkDirIterator((dir.path() + "/a\\*").c_str()).GetName());
+    EXPECT_STREQ("dev", zkDirIterator("/dev").GetName());  // a directory part of "/"
     zkDirIterator it((dir.path() + "/[a-c]*").c_str()), assigned;
     ++it;
     zkDirIterator copy(it);
@@ -124,7 +121,6 @@ TEST(DirIterator, ListsMatchingNamesInOrder) {
     assigned = assigned;
     EXPECT_TRUE(copy == it);  // the same name in another buffer
     EXPECT_FALSE(++zkDirIterator(it) == it);
-    EXPECT_STREQ("dev", zkDirIterator("/dev").GetName());  // a directory part of "/"
     std::string names;
     for (; copy != zkDirIterator(); ++copy, ++assigned) {
         EXPECT_STREQ(copy.GetName(), assigned.GetName());
@@ -134,32 +130,4 @@ TEST(DirIterator, ListsMatchingNamesInOrder) {
     EXPECT_EQ("ab b c ", names);
     EXPECT_STREQ("ab", it.GetName());
     EXPECT_FALSE(it == zkDirIterator());
-}
-
-TEST(HandleFiles, GetFileSizeGivesTheHighWordApart) {
-    zkTempDir dir;
-    ASSERT_TRUE(zkWriteFile(dir.file("h"), ""));
-    ASSERT_EQ(0, truncate(dir.file("h").c_str(), (5ll << 30) + 3));
-    const int in = CreateFile(dir.file("h").c_str(), O_RDONLY, 0, 0, 0, 0, nullptr);
-    unsigned high = 99;
-    EXPECT_EQ((1u << 30) + 3, GetFileSize(in, &high));
-    EXPECT_EQ(1u, high);
-    CloseHandle(in);
-    EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, &high));
-    EXPECT_EQ(0xFFFFFFFFu, high);
-    EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, nullptr));
-}
-
-// Each interrupted write returns short, and the rest must follow from there.
-TEST(HandleFiles, WriteFileGoesOnAfterShortWrites) {
-    if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking write as the kernel does";
-    std::string data((1 << 19) + 1000, '\0');  // not a whole number of blocks
-    for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
-    unsigned done = 0;
-    int result = 0;
-    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) {
-                  result = WriteFile(fd, data.data(), static_cast<unsigned>(data.size()), &done, nullptr);
-              }));
-    EXPECT_EQ(1, result);
-    EXPECT_EQ(data.size(), done);
 }
