@@ -88,7 +88,10 @@ int zkFileManager::GetFileList(const char* dir, const char* pattern, std::list<z
     zkFilename::Dup(&filter.m_dir, dir, -1);
     filter.Rebuild(0, 0, 0, 0, 0);
     if (access(filter.GetFullPath(), F_OK) != 0) return 1;
-    zkFilename::Dup(&filter.m_fname, pattern, -1);
+    // Only the pattern's extension counts: a folder part in it must not
+    // move the listing out of dir.
+    const char* slash = pattern != nullptr ? std::strrchr(pattern, kZkPathSeparator) : nullptr;
+    zkFilename::Dup(&filter.m_fname, slash != nullptr ? slash + 1 : pattern, -1);
     filter.Rebuild(0, 0, 0, 0, 0);
 
     Directory listing(Directory::openPath(filter.GetDirectory()));
