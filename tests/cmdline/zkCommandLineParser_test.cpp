@@ -1,16 +1,21 @@
 // Parsing command strings and argument vectors with zkCommandLineParser.
 #include <gtest/gtest.h>
 
-#include <initializer_list>
 #include <string>
+#include <vector>
 
+#include "support/zkTableFile.h"
 #include "zkCommandLineParser.h"
 
-// The values under names, joined by "|"; "<none>" stands for a missing entry.
-static std::string entries(const zkCommandLineParser& p, std::initializer_list<const char*> names) {
-    std::string out;
-    for (const char* n : names) out += "|" + std::string(p.Exists(zkStringBase(n)) ? p.GetValue(n).data() : "<none>");
-    return out.substr(1);
+// Checks the value under each name of names and values given in turn;
+// "<none>" stands for a missing entry.
+static void expectEntries(const zkCommandLineParser& p, const std::vector<std::string>& namesAndValues) {
+    for (std::size_t i = 0; i + 1 < namesAndValues.size(); i += 2) {
+        const std::string& name = namesAndValues[i];
+        SCOPED_TRACE(name);
+        const bool exists = p.Exists(zkStringBase(name.c_str()));
+        EXPECT_EQ(namesAndValues[i + 1], exists ? std::string(p.GetValue(name.c_str()).data()) : "<none>");
+    }
 }
 
 static char* arg(const char* s) {
@@ -22,29 +27,13 @@ struct Refusing : zkCommandLineParser {
     int Validate() override { return 0; }
 };
 
-// Only spaces separate items; a switch before a switch stores nothing.
 TEST(CommandLineString, SwitchesBecomeEntries) {
-    // clang-format off
-    const struct { const char* command; char switchChar, separator; std::initializer_list<const char*> names;
-                   const char* values; } cases[] = {
-        {"prog -in:data.ini -out:\"my file.ini\"", '-', ':', {"in", "out", "prog"}, "data.ini|my file.ini|<none>"},
-        {"-n: 5 -n:6 x -a:1-b:2", '-', ':', {"n", "a", "b"}, "6|1-b:2|<none>"},
-        {"-v -x:1 -a:\"\" w -b:\"x y", '-', ':', {"v -x", "x", "a", "b"}, "1|<none>||x y"},
-        {"-:x -b:2", '-', ':', {"b", ":x -b", ""}, "2|<none>|<none>"},
-        {"-:x \"y\" z -a:", '-', ':', {"", "x", "y", "z", "a"}, "<none>|<none>|<none>|<none>|<none>"},
-        {"  -p:   ab  -q:\" a b \" -r:ab\t -s:\t\r\nab", '-', ':', {"p", "q", "r", "s"}, "ab| a b |ab|ab"},
-        {"-p:a\tb -q:a\"b -r", '-', ':', {"p", "q", "r"}, "a\tb|a\"b|<none>"},
-        {"-a:-b:1 -c: -d:2", '-', ':', {"b", "ab", "a", "d", "c"}, "1|<none>|<none>|2|<none>"},
-        {"/path=out -path=x /q=1", '/', '=', {"path", "q"}, "out|1"},
-    };
-    // clang-format on
-    for (const auto& c : cases) {
-        SCOPED_TRACE(c.command);
-        zkCommandLineParser p(zkStringBase(c.command), c.switchChar, c.separator);
+    zkForEachRow("str_command_lines.txt", [](const auto& row) {
+        zkCommandLineParser p(zkStringBase(row[0].c_str()), row[1][0], row[2][0]);
         EXPECT_EQ(1, p.ParseCmdLine());
         EXPECT_EQ(1, p.IsValid());
-        EXPECT_EQ(c.values, entries(p, c.names));
-    }
+        expectEntries(p, std::vector<std::string>(row.begin() + 3, row.end()));
+    });
 }
 
 // argv[0] is skipped; without a separator the first character names the switch.
@@ -55,13 +44,13 @@ TEST(CommandLineVector, EachElementIsOneSwitch) {
     // clang-format on
     zkCommandLineParser p(12, argv);
     EXPECT_EQ(1, p.ParseCommand());
-    EXPECT_EQ("other|a:b|||x|<none>|<none>|<none>",
-              entries(p, {"in", "out", "o", "l", "", "ignored", "file.ini", "z"}));
+    expectEntries(p, {"in", "other", "out", "a:b", "o", "", "l", "", "", "x", "ignored", "<none>", "file.ini", "<none>",
+                      "z", "<none>"});
     EXPECT_EQ(1, p.SetCommand(zkStringBase("-s:1")));
-    EXPECT_EQ("1|other", entries(p, {"s", "in"}));
+    expectEntries(p, {"s", "1", "in", "other"});
     zkCommandLineParser slash(12, argv, '/', '=');
     EXPECT_EQ(1, slash.ParseArgcArgv());
-    EXPECT_EQ("out|<none>", entries(slash, {"path", "in"}));
+    expectEntries(slash, {"path", "out", "in", "<none>"});
 }
 
 // A refusing Validate makes every parse return 0; the entries stay, and the
@@ -76,12 +65,12 @@ TEST(CommandLineParser, ValidateGivesTheResult) {
     EXPECT_EQ(0, r.SetCommand(zkStringBase("-b:2")));
     EXPECT_EQ(0, r.IsValid());
     EXPECT_EQ(0, r.SetCommand(2, argv));
-    EXPECT_EQ("1|2|data.ini", entries(r, {"a", "b", "in"}));
+    expectEntries(r, {"a", "1", "b", "2", "in", "data.ini"});
     r.SetValue("b", zkStringBase("set"));
     r.SetValue("in", zkStringBase("set"));
     EXPECT_EQ(0, r.ParseCommand());
     EXPECT_EQ(0, r.IsValid());
-    EXPECT_EQ("1|set|set", entries(r, {"a", "b", "in"}));
+    expectEntries(r, {"a", "1", "b", "set", "in", "set"});
 }
 
 // A CaseInsensitive name finds an entry written in capitals. Entries get
