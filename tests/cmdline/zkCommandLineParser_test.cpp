@@ -19,9 +19,8 @@ static void expectEntries(const zkCommandLineParser& p, const std::vector<std::s
     }
 }
 
-static char* arg(const char* s) {
-    return const_cast<char*>(s);
-}
+// An element of an argument vector.
+const auto arg = [](const char* s) { return const_cast<char*>(s); };
 
 // Refuses every parse, and shows the vector state a derived class sees.
 struct Refusing : zkCommandLineParser {
