@@ -123,6 +123,7 @@ TEST(StringEditing, EditsStayWithinTheirBounds) {
         {"x", [](S& s) { s.append("", 0).append(nullptr, 5).prepend(nullptr).insert(nullptr, 0); }, "x"},
         {"x", [](S& s) { s.append("ab", 1).append("cd\0e", 0).append(S("\0z", 2)).append('\0'); }, {"xacd\0z\0", 7}},
         {"cd", [](S& s) { s.prepend("ab").prepend('>').prepend(S("\0", 1)); }, {"\0>abcd", 6}},
+        {"x", [](S& s) { s += "yz"; s += S("!"); s += '?'; }, "xyz!?"},
         {"abc", [](S& s) { s.insert("xy", 1).insert("xy", 0, 0).insert("<>", 99, 1); }, "xyaxybc<"},
         {"abc", [](S& s) { s.insert(S("1\0", 2), 2).insert(S("0"), 0); }, {"0ab1\0c", 6}},
         {"abcdef", [](S& s) { s.del(1, 2).del(4, 2).del(4, 12).del(3, 3).del(2, 3).erase(1, Bad); }, "a"},
