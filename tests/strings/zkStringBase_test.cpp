@@ -210,11 +210,14 @@ TEST(StringSearch, SearchesStopAtTheirBounds) {
         const char* pattern = row[2].c_str();
         const unsigned start = position(row[3]), n = position(row[4]);
         const bool exact = row[5] == "exact";
-        const std::map<std::string, unsigned> found = {{"find", text.find(pattern, start, n, exact)},
-                                                       {"findc", text.find(pattern[0], start, exact)},
-                                                       {"rfind", text.rfind(pattern, start, n, exact)},
-                                                       {"rfindc", text.rfind(pattern[0], start, exact)},
-                                                       {"findFirstOf", text.findFirstOf(pattern, start, n, exact)}};
+        // clang-format off
+        const std::map<std::string, unsigned> found = {
+            {"find", text.find(pattern, start, n, exact)}, {"findc", text.find(pattern[0], start, exact)},
+            {"findS", text.find(zkStr(row[2]), start, exact)}, {"rfind", text.rfind(pattern, start, n, exact)},
+            {"rfindc", text.rfind(pattern[0], start, exact)}, {"rfindS", text.rfind(zkStr(row[2]), start, exact)},
+            {"findFirstOf", text.findFirstOf(pattern, start, n, exact)},
+            {"findFirstOfS", text.findFirstOf(zkStr(row[2]), start, exact)}};
+        // clang-format on
         EXPECT_EQ(position(row[6]), found.at(row[0]));
     });
     // By default from the start (backwards from the end), case-sensitive.
@@ -223,6 +226,8 @@ TEST(StringSearch, SearchesStopAtTheirBounds) {
     EXPECT_EQ(1u, zkStr({"a\0b", 3}).findFirstOf(zkStr({"\0", 1})));
     EXPECT_EQ(4u, zkStr("abxab").rfind('b'));
     EXPECT_EQ(Bad, zkStr("").rfind('a'));
+    // Bytes past the length, here left behind by cut, are never searched.
+    EXPECT_EQ(Bad, zkStr("hello").cut(2).find('o', 1));
 }
 
 // The long search finds what the short one finds, shifted by the filler, and
