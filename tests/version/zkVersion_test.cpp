@@ -2,11 +2,10 @@
 // version.
 #include <gtest/gtest.h>
 
-#include <climits>
-#include <cstring>
 #include <string>
 #include <vector>
 
+#include "support/zkTableFile.h"
 #include "zkVersionDescriptor.h"
 #include "zkutilVersion.h"
 
@@ -21,24 +20,18 @@ TEST(VersionDescriptor, StartsAtZero) {
     expectFields(0, 0, 0, zkVersionDescriptor(".5"));
 }
 
-// Text of any length, with or without a full stop, numbers clamped to 32 bits,
-// each read from a heap buffer of its exact size so that a read past the end
-// is caught. Unparsable text leaves the version alone.
+// Each text is read from a heap buffer of its exact size, so that a read past
+// the end is caught. A null text leaves the version alone too.
 TEST(VersionDescriptor, ParsesText) {
-    // clang-format off
-    const struct { const char* text; int major, minor; char subMinor; } rows[] = {
-        {"1.10a", 1, 10, '0'}, {"1.05", 1, 5, '5'}, {"2.1a", 2, 1, 'a'}, {"1.2.3", 1, 2, '.'}, {"1.-2", 1, 0, '2'}, {"", 9, 9, 0},
-        {nullptr, 9, 9, 0}, {"2.", 2, 0, 0}, {".5", 9, 9, 0}, {"5", 5, 0, 0}, {"1234.5678z", 1234, 5678, 'z'},
-        {"1.9999999999", 1, INT_MAX, '9'}, {"-9999999999.1", INT_MIN, 1, 0}, {"9999999999", INT_MAX, 0, 0},
-    };
-    // clang-format on
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.text ? row.text : "null");
-        const std::vector<char> text(row.text, row.text + (row.text ? std::strlen(row.text) + 1 : 0));
+    zkForEachRow("str_versions.txt", [](const auto& row) {
+        const std::vector<char> text(row[0].c_str(), row[0].c_str() + row[0].size() + 1);
         zkVersionDescriptor v("9.9");
-        EXPECT_EQ(0, v.SetVersionDescriptor(row.text ? text.data() : nullptr));
-        expectFields(row.major, row.minor, row.subMinor, v);
-    }
+        EXPECT_EQ(0, v.SetVersionDescriptor(text.data()));
+        expectFields(std::stoi(row[1]), std::stoi(row[2]), row[3][0], v);
+    });
+    zkVersionDescriptor v("9.9");
+    EXPECT_EQ(0, v.SetVersionDescriptor(nullptr));
+    expectFields(9, 9, 0, v);
     const char shifted[] = "95";  // the byte before the text is never read
     expectFields(5, 0, 0, zkVersionDescriptor(shifted + 1));
 }
