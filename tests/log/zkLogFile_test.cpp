@@ -3,17 +3,13 @@
 #include <gtest/gtest.h>
 
 #include <ctime>
-#include <sstream>
-#include <vector>
 
 #include "support/zkTempDir.h"
 #include "zkLogFile.h"
 
-using Level = zkLogFile::LogLevel;
-
-// By default a line is the local time "HH:MM:SS MM/DD/YY", two blanks and the
-// message; with entry numbers on, the number and ") " lead it. Written again,
-// to a file the constructor clears, when the clock moved meanwhile.
+// A line is the entry number and ") " when asked for, the local time
+// "HH:MM:SS MM/DD/YY" (on by default), two blanks and the message. Written
+// again, to a file the constructor clears, when the clock moved meanwhile.
 TEST(LogFile, LineFormat) {
     zkTempDir dir;
     ASSERT_TRUE(zkWriteFile(dir.file("app.log"), "old\n"));
@@ -26,11 +22,10 @@ TEST(LogFile, LineFormat) {
     do {
         stamp = clock();
         zkLogFile log(zkStringBase(dir.file("app.log").c_str()), 1);
-        log.Log("Disk full", Level(1));
         log.SetOption(zkLogFile::OptionEntryNumber, 1);
-        log.Log("Disk full", Level(1));
+        log.Log("Disk full", zkLogFile::LevelNormal);
     } while (stamp != clock());
-    EXPECT_EQ(stamp + "  Disk full\n1) " + stamp + "  Disk full\n", zkReadFile(dir.file("app.log")));
+    EXPECT_EQ("1) " + stamp + "  Disk full\n", zkReadFile(dir.file("app.log")));
 }
 
 // Only entries at or below the log's level (1 at first) are written and
@@ -42,8 +37,7 @@ TEST(LogFile, LineFormat) {
 TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
     zkTempDir dir;
     const std::string first = dir.file("m.log"), second = dir.file("n.log"), folder = dir.file("folder");
-    ASSERT_TRUE(zkWriteFile(first, "kept\n"));
-    ASSERT_TRUE(zkWriteFile(second, "old\n"));
+    for (const std::string& file : {first, second}) ASSERT_TRUE(zkWriteFile(file, "kept\n"));
     ASSERT_TRUE(std::filesystem::create_directory(folder));
     zkLogFile log(zkStringBase(first.c_str()), 0);
     EXPECT_EQ(0u, log.GetOption(zkLogFile::OptionReserved));
@@ -51,27 +45,26 @@ TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
     log.SetOption(zkLogFile::OptionEntryNumber, 1);
     testing::internal::CaptureStdout();
     log.UseDisplay();
-    log.Log("filtered", Level(2));
-    log.Log(zkStringBase("50% %s %n"), Level(1));
-    log.Log("count", -42L, Level(1));
-    log.Log("name", "x", Level(0));
-    log.Log(nullptr, "v", Level(1));
-    log.Log("t", static_cast<const char*>(nullptr), Level(1));
-    log.Log(static_cast<const char*>(nullptr), Level(1));
-    log.SetLevel(Level(0));
-    log.Log("dropped", "two", Level(1));
-    log.Log("dropped", 2L, Level(1));
-    log.SetLevel(Level(-1));
-    log.Log("dropped", Level(0));
+    log.Log("filtered", zkLogFile::LevelDetail);
+    log.Log("filtered", "two", zkLogFile::LevelDetail);
+    log.Log("filtered", 2L, zkLogFile::LevelDetail);
+    log.Log(zkStringBase("50% %s %n"), zkLogFile::LevelNormal);
+    log.Log("count", -42L, zkLogFile::LevelNormal);
+    log.Log("name", "x", zkLogFile::LevelError);
+    log.Log(nullptr, "v", zkLogFile::LevelNormal);
+    log.Log("t", static_cast<const char*>(nullptr), zkLogFile::LevelNormal);
+    log.Log(static_cast<const char*>(nullptr), zkLogFile::LevelNormal);
+    log.SetLevel(zkLogFile::LogLevel(-1));
+    log.Log("dropped", zkLogFile::LevelError);
     log.SetOption(zkLogFile::OptionReserved, 7);
     log.SetFilename(second.c_str(), 1);
     EXPECT_EQ(0u, log.GetOption(zkLogFile::OptionReserved));
-    log.Log("third", Level(-1));
+    log.Log("third", zkLogFile::LogLevel(-1));
     log.SetOption(zkLogFile::OptionEntryNumber, 0);
-    ASSERT_TRUE(zkWithFileSizeLimit(9, [&] { log.Log("refused", Level(-1)); }));
+    ASSERT_TRUE(zkWithFileSizeLimit(9, [&] { log.Log("refused", zkLogFile::LogLevel(-1)); }));
     log.SetFilename(folder.c_str(), 1);
     log.UseDisplay();
-    log.Log("lost", Level(-1));
+    log.Log("lost", zkLogFile::LogLevel(-1));
     EXPECT_EQ("1) 50% %s %n\nlost\n", testing::internal::GetCapturedStdout());
     EXPECT_EQ("kept\n1) 50% %s %n\n2) count -42\n3) name x\n4)  v\n5) t \n6) \n", zkReadFile(first));
     EXPECT_EQ("7) third\n", zkReadFile(second));
@@ -93,21 +86,22 @@ TEST(LogFile, MakeTDNumPadsWithSignedComparisons) {
     }
 }
 
-// Entries from four threads, one log object each, all arrive whole and once.
+// Entries from four threads, one log object each, all arrive whole and once,
+// unnumbered by default.
 TEST(LogLoad, EveryConcurrentEntryArrivesWholeOnce) {
     zkTempDir dir;
     const std::string pad(200, '.');
     std::multiset<std::string> expected, lines;
-    std::vector<std::thread> writers;
+    std::thread writers[4];
     for (int w = 0; w < 4; ++w)
-        writers.emplace_back([&, w] {
+        writers[w] = std::thread([&, w] {
             zkLogFile log(zkStringBase(dir.file("load.log").c_str()), 0);
             log.SetOption(zkLogFile::OptionTimeStamp, 0);
-            for (int n = w; n < 2000; n += 4) log.Log((std::to_string(n) + pad).c_str(), Level(1));
+            for (int n = w; n < 2000; n += 4) log.Log((std::to_string(n) + pad).c_str(), zkLogFile::LevelNormal);
         });
     for (int n = 0; n < 2000; ++n) expected.insert(std::to_string(n) + pad);
     for (std::thread& writer : writers) writer.join();
-    std::istringstream in(zkReadFile(dir.file("load.log")));
+    std::ifstream in(dir.file("load.log"));
     for (std::string line; std::getline(in, line);) lines.insert(line);
     EXPECT_EQ(expected, lines);
 }

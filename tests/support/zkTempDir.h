@@ -1,8 +1,7 @@
 // Test helpers: a temporary directory that removes itself, whole-file reads
 // and writes for comparing exact bytes, directory listings, a file size
 // limit for provoking failed writes, and a pipe that takes writes in pieces.
-#ifndef ZK_TESTS_TEMP_DIR_H
-#define ZK_TESTS_TEMP_DIR_H
+#pragma once
 
 #include <errno.h>
 #include <fcntl.h>
@@ -41,8 +40,7 @@ private:
 
 // The whole content of a file, or "" when it cannot be read.
 inline std::string zkReadFile(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    return std::string(std::istreambuf_iterator<char>(std::ifstream(path, std::ios::binary).rdbuf()), {});
 }
 
 // Replaces a file's content with `bytes`; true when written.
@@ -111,5 +109,3 @@ std::string zkReadFromShortWrites(Write write) {
     sigaction(SIGUSR1, &saved, nullptr);
     return got;
 }
-
-#endif
