@@ -21,6 +21,9 @@
 
 // A new directory under $TMPDIR (or /tmp), removed with all it holds.
 class zkTempDir {
+    std::string m_path;
+    std::error_code m_removeError;  // a tree that cannot go is left behind
+
 public:
     zkTempDir() : m_path(std::filesystem::temp_directory_path().string() + "/zkutil-test-XXXXXX") {
         // Without the directory every path would name a file in the root.
@@ -32,10 +35,6 @@ public:
     const std::string& path() const { return m_path; }
     // The path of `name` inside the directory.
     std::string file(const std::string& name) const { return m_path + "/" + name; }
-
-private:
-    std::string m_path;
-    std::error_code m_removeError;  // a tree that cannot go is left behind
 };
 
 // The whole content of a file, or "" when it cannot be read.
@@ -48,11 +47,11 @@ inline bool zkWriteFile(const std::string& path, const std::string& bytes) {
     return static_cast<bool>(std::ofstream(path, std::ios::binary) << bytes << std::flush);
 }
 
-// The names in a directory, "." and ".." left out; empty when it cannot be read.
+// The names in a directory, "." and ".." left out; throws when it cannot be
+// read.
 inline std::set<std::string> zkDirEntries(const std::string& path) {
     std::set<std::string> names;
-    std::error_code error;
-    for (const auto& entry : std::filesystem::directory_iterator(path, error)) names.insert(entry.path().filename());
+    for (const auto& entry : std::filesystem::directory_iterator(path)) names.insert(entry.path().filename());
     return names;
 }
 
