@@ -12,12 +12,10 @@
 #include "zkFileManager.h"
 #include "zkMappedINIFile.h"
 
-namespace {
-
 const std::string kOld = "[old]\nk=v\n\n", kValue(3000, 'n'), kNew = "[s]\nk=" + kValue + "\n\n";
 
 // The overwriting copy of source over target, or the INI save of target.
-int replace(bool copy, const std::string& source, const std::string& target) {
+static int replace(bool copy, const std::string& source, const std::string& target) {
     zkStringBase from(source.c_str()), to(target.c_str());
     if (copy) return zkFileManager::CopyFile(from, to, 0, 0, 1, 0, 0, nullptr, nullptr);
     zkMappedINIFile ini(target.c_str());
@@ -25,23 +23,27 @@ int replace(bool copy, const std::string& source, const std::string& target) {
     return ini.Close(1);
 }
 
-// The permission bits, set-id and sticky bits included, of path itself; 0
-// when there is no such file.
-unsigned modeOf(const std::string& path) {
+// What lstat says of path, its mode cut to the permission bits (set-id and
+// sticky bits included); all zero when there is no such file.
+static struct stat statOf(const std::string& path) {
     struct stat st = {};
-    return lstat(path.c_str(), &st) == 0 ? st.st_mode & 07777 : 0;
+    st.st_mode = lstat(path.c_str(), &st) == 0 ? st.st_mode & 07777 : 0;
+    return st;
 }
 
 // A target: its name and mode, whether it is reached through a symbolic
 // link, and the mode of its directory (0: left alone). A directory that is
 // not the replacing user's to write in, or whose sticky bit guards the old
-// file, sends the replace to the in-place way.
+// file, sends the replace to the in-place way. In the set-group-ID
+// directory the old file is root's, in nobody's group: nobody may give the
+// new file that group, though not that owner.
 // clang-format off
 struct Target { const char* label; std::string name; mode_t mode; bool throughLink; mode_t dirMode; };
 const Target kTargets[] = {
-    {"plain", "a.ini", 0644, false, 0},  {"set-user-ID and set-group-ID", "a.ini", 06775, false, 0},
-    {"250-byte name", std::string(246, 'n') + ".ini", 0640, false, 0},  {"symbolic link", "link.ini", 0600, true, 0},
-    {"unwritable directory", "a.ini", 0666, false, 0555},  {"sticky directory", "a.ini", 0666, false, 01777}};
+    {"private", "a.ini", 0600, false, 0},  {"set-user-ID and set-group-ID", "a.ini", 06775, false, 0},
+    {"250-byte name, set-group-ID directory", std::string(246, 'n') + ".ini", 0640, false, 02777},
+    {"symbolic link", "link.ini", 0644, true, 0},  {"unwritable directory", "a.ini", 0666, false, 0555},
+    {"sticky directory", "a.ini", 0666, false, 01777}};
 // clang-format on
 
 // A temporary directory holding the copy's source and the target.
@@ -52,33 +54,36 @@ struct Sandbox {
         EXPECT_EQ(0, t.throughLink ? symlink("real.ini", dir.file(t.name).c_str()) : 0);
         EXPECT_EQ(0, chmod(real.c_str(), t.mode));
         EXPECT_EQ(0, t.dirMode ? chmod(dir.path().c_str(), t.dirMode) : 0);
+        EXPECT_EQ(0, t.dirMode == 02777 && geteuid() == 0 ? chown(real.c_str(), 0, 65534) : 0);
     }
     ~Sandbox() { chmod(dir.path().c_str(), 0700); }
 
-    // Runs the replace in a child with umask 000 and writes past limit
-    // failing, as another user (nobody) where the directory stops only
-    // others: permission bits do not stop root. Meanwhile each new file (a
-    // child makes one at a time) that grants more than the old one when the
-    // kernel reports it goes into opened. The child's result; 100 when the
-    // user or the limit could not be set.
-    int replaceInChild(bool copy, unsigned long long limit) {
-        struct pollfd watch = {inotify_init1(IN_CLOEXEC | IN_NONBLOCK), POLLIN, 0};
-        EXPECT_NE(-1, inotify_add_watch(watch.fd, dir.path().c_str(), IN_CREATE));
+    // Runs the replace in a child, from inside the directory (whatever its
+    // parents allow) with umask 000 and writes past limit failing, as another
+    // user (nobody) where the directory stops only others: permission bits do
+    // not stop root. Meanwhile each new file (a child makes one at a time)
+    // that grants more than the old one when the kernel reports it goes into
+    // opened. The child's result; 100 when the user or the limit could not be
+    // set, 101 when the replace left a descriptor open.
+    int replaceInChild(bool copy, unsigned long long limit, const char* source = "source") {
+        struct pollfd w = {inotify_init1(IN_CLOEXEC | IN_NONBLOCK), POLLIN, 0};  // what is made in dir
+        EXPECT_NE(-1, inotify_add_watch(w.fd, dir.path().c_str(), IN_CREATE));
         const pid_t pid = fork();
         if (pid == 0) {
             int result = 100;
+            const std::set<std::string> open = zkDirEntries("/proc/self/fd");
             umask(0);
-            if (!target.dirMode || geteuid() != 0 || (setgid(65534) == 0 && setuid(65534) == 0))
-                zkWithFileSizeLimit(limit, [&] { result = replace(copy, dir.file("source"), dir.file(target.name)); });
-            _exit(result);
+            if (!chdir(dir.path().c_str()) && (!target.dirMode || geteuid() != 0 || (!setgid(65534) && !setuid(65534))))
+                zkWithFileSizeLimit(limit, [&] { result = replace(copy, source, target.name); });
+            _exit(zkDirEntries("/proc/self/fd") == open ? result : 101);
         }
         int status = -1;
         alignas(struct inotify_event) char buf[4096];
         const auto* e = reinterpret_cast<const struct inotify_event*>(buf);
         while (waitpid(pid, &status, WNOHANG) == 0)
-            if (poll(&watch, 1, 1) && read(watch.fd, buf, sizeof buf) > 0 && (modeOf(dir.file(e->name)) & ~target.mode))
+            if (poll(&w, 1, 1) && read(w.fd, buf, sizeof buf) > 0 && (statOf(dir.file(e->name)).st_mode & ~target.mode))
                 opened.insert(e->name);
-        close(watch.fd);
+        close(w.fd);
         return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
     }
 
@@ -88,12 +93,11 @@ struct Sandbox {
     std::set<std::string> opened;
 };
 
-}  // namespace
-
 // A write may fail at any offset (every one near the ends and a stride
 // between, for a plain or private file and in place), beside the file or in
-// place: the old bytes, mode and link stay, and nothing else is left in the
-// directory. A whole write leaves the new bytes under the old mode. With
+// place: the old bytes and mode stay, and nothing else is left in the
+// directory. A whole write leaves the new bytes under the old mode and
+// group, in the file a link leads to (so the link stays). With
 // umask 000, no new file grants more than the old one from the moment it
 // appears: another process looks at each while the replace runs.
 TEST(SafeReplace, FailedReplaceKeepsTheOldFile) {
@@ -102,41 +106,43 @@ TEST(SafeReplace, FailedReplaceKeepsTheOldFile) {
             SCOPED_TRACE(std::string(copy ? "overwriting CopyFile, " : "INI Close(1), ") + t.label);
             Sandbox box(t);
             const std::set<std::string> before = zkDirEntries(box.dir.path());
-            const size_t step = t.dirMode == 0555 || t.mode == 0644 || t.mode == 0600 ? 61 : kNew.size() - 1000;
+            const gid_t group = statOf(box.real).st_gid;
+            const size_t step = t.dirMode == 0555 || t.mode == 0600 ? 61 : kNew.size() - 1000;
             for (size_t limit = step == 61 ? 1 : 1000; limit <= kNew.size();
                  limit += limit < 16 || limit + 16 > kNew.size() ? 1 : step) {
                 ASSERT_EQ(limit == kNew.size() ? 0 : 1, box.replaceInChild(copy, limit)) << limit;
                 ASSERT_EQ(limit == kNew.size() ? kNew : kOld, zkReadFile(box.real)) << limit;
-                ASSERT_EQ(t.mode, modeOf(box.real)) << limit;
+                ASSERT_EQ(t.mode, statOf(box.real).st_mode) << limit;
+                ASSERT_EQ(group, statOf(box.real).st_gid) << limit;
                 ASSERT_EQ(before, zkDirEntries(box.dir.path())) << limit;
             }
-            EXPECT_EQ(t.throughLink, std::filesystem::is_symlink(box.dir.file(t.name)));
             EXPECT_EQ(std::set<std::string>(), box.opened);
         }
     }
 }
 
-// A source that holds less than its size says fails the copy after some
-// bytes are written. In place, where the size the source claims is reserved
-// first, the old bytes and length come back.
-TEST(SafeReplace, CopyOfAShortSourceKeepsTheOldFile) {
+// In place, where the size the source claims is reserved first: a copy of
+// an empty source leaves an empty file, and a source that holds less than
+// its size says fails the copy after some bytes are written, and the old
+// bytes and length (one byte here) come back.
+TEST(SafeReplace, InPlaceCopyOfAnEmptyOrShortSource) {
+    Sandbox box(kTargets[4]);
+    ASSERT_TRUE(zkWriteFile(box.dir.file("source"), ""));
+    EXPECT_EQ(0, box.replaceInChild(true, RLIM_INFINITY));
+    EXPECT_EQ("", zkReadFile(box.real));
     const char* const shortFile = "/sys/devices/system/cpu/online";
     if (!std::filesystem::exists(shortFile) || zkReadFile(shortFile).size() >= std::filesystem::file_size(shortFile))
         GTEST_SKIP() << "no file here holds less than its size";
-    Sandbox box(kTargets[4]);
-    ASSERT_EQ(0, unlink(box.dir.file("source").c_str()));
-    ASSERT_EQ(0, symlink(shortFile, box.dir.file("source").c_str()));
-    EXPECT_EQ(1, box.replaceInChild(true, RLIM_INFINITY));
-    EXPECT_EQ(kOld, zkReadFile(box.real));
+    ASSERT_TRUE(zkWriteFile(box.real, "x"));
+    EXPECT_EQ(1, box.replaceInChild(true, RLIM_INFINITY, shortFile));
+    EXPECT_EQ("x", zkReadFile(box.real));
 }
 
 TEST(FileSystem, WriteAllGoesOnAfterShortWrites) {
     if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking write as the kernel does";
     std::string data((1 << 19) + 1000, '\0');  // not a whole number of blocks
     for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
-    int result = 1;
-    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) { result = zkWriteAll(fd, data.data(), data.size()); }));
-    EXPECT_EQ(0, result);
+    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) { EXPECT_EQ(0, zkWriteAll(fd, data.data(), data.size())); }));
 }
 
 // Relative targets are relative to the link's directory; a chain longer
@@ -174,6 +180,7 @@ TEST(FileSystem, FailuresGiveOne) {
     for (const std::string& path : {std::string(), dir.file("f/x"), dir.file("none/x")})
         EXPECT_EQ(1, zkReplaceFile(path.c_str(), 0644, 0, writes)) << path;
     EXPECT_EQ(1, zkReplaceFile(nullptr, 0644, 0, writes));
+    EXPECT_EQ(1, zkWriteAll(-1, "y", 1));
     EXPECT_EQ(1, zkReplaceFile(dir.file("loop").c_str(), 0644, 0, writes));
     EXPECT_EQ(ELOOP, errno);
     EXPECT_EQ(1, zkReplaceFile(dir.file("f").c_str(), 0644, 0, fails));
