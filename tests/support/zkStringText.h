@@ -1,10 +1,7 @@
 // Test helpers: zkStringBase from and to std::string, zero bytes included.
-#ifndef ZK_TESTS_STRING_TEXT_H
-#define ZK_TESTS_STRING_TEXT_H
+#pragma once
 
 #include <gtest/gtest.h>
-
-#include <string>
 
 #include "zkStringBase.h"
 
@@ -20,5 +17,3 @@ inline std::string zkText(const zkStringBase& s) {
     EXPECT_EQ('\0', s.data()[s.length()]);
     return std::string(s.data(), s.length());
 }
-
-#endif

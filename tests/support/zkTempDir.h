@@ -1,80 +1,57 @@
 // Test helpers: a temporary directory that removes itself, whole-file reads
-// and writes for comparing exact bytes, directory listings, and a file size
-// limit for provoking failed writes.
-#ifndef ZK_TESTS_TEMP_DIR_H
-#define ZK_TESTS_TEMP_DIR_H
+// and writes for comparing exact bytes, directory listings, a file size
+// limit for provoking failed writes, and a pipe that takes writes in pieces.
+#pragma once
 
-#include <dirent.h>
+#include <errno.h>
 #include <fcntl.h>
-#include <ftw.h>
-#include <pthread.h>
 #include <signal.h>
-#include <stdio.h>
 #include <stdlib.h>
 #include <sys/ioctl.h>
 #include <sys/resource.h>
 #include <unistd.h>
 
 #include <atomic>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <set>
-#include <sstream>
 #include <string>
 #include <thread>
 
+// A new directory under $TMPDIR (or /tmp), removed with all it holds.
 class zkTempDir {
+    std::string m_path;
+    std::error_code m_removeError;  // a tree that cannot go is left behind
+
 public:
-    zkTempDir() {
-        const char* base = getenv("TMPDIR");
-        std::string pattern = std::string(base && *base ? base : "/tmp") + "/zkutil-test-XXXXXX";
+    zkTempDir() : m_path(std::filesystem::temp_directory_path().string() + "/zkutil-test-XXXXXX") {
         // Without the directory every path would name a file in the root.
-        if (mkdtemp(&pattern[0]) == nullptr) {
-            perror(pattern.c_str());
-            abort();
-        }
-        m_path = pattern;
+        if (mkdtemp(&m_path[0]) == nullptr) throw std::system_error(errno, std::generic_category(), m_path);
     }
-    ~zkTempDir() {
-        if (!m_path.empty()) nftw(m_path.c_str(), removeEntry, 16, FTW_DEPTH | FTW_PHYS);
-    }
-    zkTempDir(const zkTempDir&) = delete;
-    zkTempDir& operator=(const zkTempDir&) = delete;
+    ~zkTempDir() { std::filesystem::remove_all(m_path, m_removeError); }
 
     // The directory, without a trailing slash.
     const std::string& path() const { return m_path; }
     // The path of `name` inside the directory.
     std::string file(const std::string& name) const { return m_path + "/" + name; }
-
-private:
-    static int removeEntry(const char* path, const struct stat*, int, struct FTW*) {
-        ::remove(path);
-        return 0;
-    }
-    std::string m_path;
 };
 
 // The whole content of a file, or "" when it cannot be read.
 inline std::string zkReadFile(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    return std::string(std::istreambuf_iterator<char>(std::ifstream(path, std::ios::binary).rdbuf()), {});
 }
 
 // Replaces a file's content with `bytes`; true when written.
 inline bool zkWriteFile(const std::string& path, const std::string& bytes) {
-    std::ofstream out(path, std::ios::binary | std::ios::trunc);
-    out << bytes;
-    return static_cast<bool>(out.flush());
+    return static_cast<bool>(std::ofstream(path, std::ios::binary) << bytes << std::flush);
 }
 
-// The names in a directory, "." and ".." left out; empty when it cannot be read.
+// The names in a directory, "." and ".." left out; throws when it cannot be
+// read.
 inline std::set<std::string> zkDirEntries(const std::string& path) {
     std::set<std::string> names;
-    DIR* dir = opendir(path.c_str());
-    while (const dirent* entry = dir ? readdir(dir) : nullptr) names.insert(entry->d_name);
-    if (dir) closedir(dir);
-    names.erase(".");
-    names.erase("..");
+    for (const auto& entry : std::filesystem::directory_iterator(path)) names.insert(entry.path().filename());
     return names;
 }
 
@@ -101,10 +78,10 @@ inline bool zkUnderEmulator() {
     return getenv("ZK_TEST_UNDER_EMULATOR") != nullptr;
 }
 
-// Runs write with the write end of a pipe whose reader interrupts the
-// writer with a signal whenever the pipe is full, so that writes of more
-// than the pipe holds return short. Returns all that the reader got and
-// puts the signal's handling back.
+// Runs write on another thread with the write end of a pipe, and interrupts
+// that thread with a signal whenever the pipe is full, so that writes of
+// more than the pipe holds return short. Returns all that came through the
+// pipe, and puts the signal's handling back.
 template <class Write>
 std::string zkReadFromShortWrites(Write write) {
     struct sigaction action = {}, saved;
@@ -112,25 +89,22 @@ std::string zkReadFromShortWrites(Write write) {
     int ends[2];
     if (sigaction(SIGUSR1, &action, &saved) != 0 || pipe2(ends, O_CLOEXEC) != 0) return "";
     const int capacity = fcntl(ends[1], F_GETPIPE_SZ);
-    const pthread_t writer = pthread_self();
     std::atomic<bool> finished{false};
-    std::string got;
-    std::thread reader([&] {
-        char block[4096];
-        for (ssize_t n = 1; n > 0; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
-            int queued = 0;
-            while (!finished && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity) usleep(100);
-            if (!finished) pthread_kill(writer, SIGUSR1);
-            n = read(ends[0], block, sizeof block);
-        }
+    std::thread writer([&] {
+        write(ends[1]);
+        finished = true;
+        close(ends[1]);
     });
-    write(ends[1]);
-    finished = true;
-    close(ends[1]);
-    reader.join();
+    std::string got;
+    char block[4096];
+    for (ssize_t n = 1; n > 0; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
+        int queued = 0;
+        while (!finished && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity) usleep(100);
+        if (!finished) pthread_kill(writer.native_handle(), SIGUSR1);
+        n = read(ends[0], block, sizeof block);
+    }
+    writer.join();
     close(ends[0]);
     sigaction(SIGUSR1, &saved, nullptr);
     return got;
 }
-
-#endif
