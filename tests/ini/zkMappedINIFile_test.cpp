@@ -30,6 +30,7 @@ TEST(IniLoad, ReadingRules) {
         body += unit + (i == 500 ? "long = " + longValue + "\n" : "");
         dump += "k:k|v\nk:a|b\nc:;c\nk:q|r\n" + (i == 500 ? "k:long|" + longValue + "\n" : "");
     }
+    rows.emplace_back(std::string(40000, '#') + "\n[s]\nk=v\n", "[s]\nk:k|v\n");  // the first piece holds no line end
     for (size_t shift = 0; shift < unit.size(); ++shift) rows.emplace_back(std::string(shift, ';') + "\n" + body, dump);
     zkTempDir dir;
     for (const auto& row : rows) {
@@ -44,13 +45,15 @@ TEST(IniLoad, ReadingRules) {
 // Clear empties the document and keeps its file name. A failed Open, a read
 // error included, leaves the document as it was and makes no file. The
 // process's own memory opens for reading and writing, but reading its first
-// page fails; a name of 4096 bytes is refused, not shortened to another file.
+// page fails; a name of 4096 bytes is refused, not shortened to another
+// file; a FIFO opens, but cannot be read from its start.
 TEST(IniLoad, OpenAppendsWhatItReadsOrNothing) {
     zkTempDir dir;
     const std::string missing = dir.file("missing.ini"), made = dir.file("made.ini");
     const std::string tooLong = dir.path() + std::string(4096 - dir.path().size() - 5, '/') + "a.ini";
     const std::pair<std::string, unsigned> failures[] = {
-        {missing, 0}, {dir.path(), 1}, {"/proc/self/mem", 1}, {tooLong, 0}};
+        {missing, 0}, {dir.path(), 1}, {"/proc/self/mem", 1}, {tooLong, 0}, {dir.file("fifo"), 0}};
+    ASSERT_EQ(0, mkfifo(failures[4].first.c_str(), 0666));
     zkMappedINIFile ini;
     ini.SetVal(zkStr("keep"), zkStr("k"), zkStr("v"));
     for (const auto& row : failures) {
@@ -86,6 +89,7 @@ TEST(IniAccess, NamesMatchWithoutRegardToCase) {
     zkStringBase out("untouched");
     EXPECT_EQ(1, ini.GetVal(zkStr("net"), zkStr("none"), out));
     EXPECT_EQ("untouched", zkText(out));
+    EXPECT_EQ(1, ini.GetVal(zkStr("none"), zkStr("k"), out));
     EXPECT_EQ(0, ini.GetVal(zkStr("OTHER"), zkStr("K"), out));
     EXPECT_EQ("1", zkText(out));
 
