@@ -17,7 +17,8 @@
 // In files longer than the pieces Open reads them in, a line end, a CR LF
 // or a run of blank lines split between two pieces, and a line longer than a
 // piece, read as in a short file; each shift of the text puts the piece
-// boundaries at other places of the repeated unit.
+// boundaries at other places of the repeated unit. So does a first line
+// longer than the first pieces.
 TEST(IniLoad, ReadingRules) {
     std::vector<std::pair<std::string, std::string>> rows = {{"", ""}, {"\n\n  \r\n\t\r\r\n \n", ""}};
     for (std::string name : {"crlf", "header_comment", "bom", "short_lines", "lone_characters"})
@@ -30,7 +31,7 @@ TEST(IniLoad, ReadingRules) {
         body += unit + (i == 500 ? "long = " + longValue + "\n" : "");
         dump += "k:k|v\nk:a|b\nc:;c\nk:q|r\n" + (i == 500 ? "k:long|" + longValue + "\n" : "");
     }
-    rows.emplace_back(std::string(40000, '#') + "\n[s]\nk=v\n", "[s]\nk:k|v\n");  // the first piece holds no line end
+    rows.emplace_back(std::string(40000, '#') + "\n[s]\nk=v\n", "[s]\nk:k|v\n");
     for (size_t shift = 0; shift < unit.size(); ++shift) rows.emplace_back(std::string(shift, ';') + "\n" + body, dump);
     zkTempDir dir;
     for (const auto& row : rows) {
