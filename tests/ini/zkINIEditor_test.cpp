@@ -10,6 +10,7 @@
 #include <cerrno>
 #include <cstring>
 #include <list>
+#include <thread>
 
 #include "ini/zkIniTestSupport.h"
 #include "internal/zkStringRules.h"
@@ -70,13 +71,15 @@ int exitStatusOf(pid_t pid) {
 TEST(IniEditor, EditChangesOnlyItsLines) {
     zkTempDir dir;
     const std::string path = dir.file("edit.ini");
-    zkINIEditor from;  // loaded for each row: Load replaces what it held
+    // One editor opens every file and another loads every merged text: Open and
+    // Load replace what they held.
+    zkINIEditor editor(path.c_str()), from;
     zkForEachRow("ini_edits.txt", [&](const auto& row) {
         const std::string original = zkTestText(row[0]);
         std::string expected = original;
         expected.replace(expected.find(row[6]), row[6].size(), row[7]);
         ASSERT_TRUE(zkWriteFile(path, original));
-        zkINIEditor editor(path.c_str()), other(path.c_str());
+        zkINIEditor other(path.c_str());
         ASSERT_EQ(Done, editor.Open(false, true));
         from.Load(row[4].data(), row[4].size());
         const zkStringBase section = zkStr(row[2]), key = zkStr(row[3]);
@@ -115,6 +118,12 @@ TEST(IniEditor, SavesAnUntouchedFileByteForByte) {
         EXPECT_EQ(Done, editor.Save());
         EXPECT_EQ(original, zkReadFile(dir.file(row[0])));
     });
+    // A file whose size says less than it holds is read whole.
+    zkINIEditor proc("/proc/self/cmdline");
+    ASSERT_EQ(Done, proc.Open(false, false));
+    zkStringBase text;
+    proc.GetText(text);
+    EXPECT_EQ(zkReadFile("/proc/self/cmdline"), zkText(text));
 }
 
 // The lines before the first header are the section of the empty name when
@@ -187,6 +196,20 @@ TEST(IniEditorLock, LockIsHeldFromOpenUntilClose) {
     EXPECT_EQ("2", zkText(value));
     EXPECT_EQ(kBlocked, openResult(direct));
     throughLink.Close();
+
+    // A waiter that gets the lock of the file the holder's save replaced
+    // moves on to the new file and waits for its holder too.
+    ASSERT_EQ(Done, holder.Open(false, true));
+    std::thread waiter([&] { EXPECT_EQ(Done, openResult(direct, false, true, 10000).first); });
+    usleep(100000);  // the waiter waits on the old file
+    EXPECT_EQ(Done, holder.SetVal(zkStr("s"), zkStr("k"), zkStr("3")));
+    EXPECT_EQ(Done, holder.Save());
+    usleep(100000);
+    holder.Close();
+    waiter.join();
+    EXPECT_EQ(Done, direct.GetVal(zkStr("s"), zkStr("k"), value));
+    EXPECT_EQ("3", zkText(value));
+    direct.Close();
 
     // The holder's process takes the lock and is killed holding it.
     EXPECT_EQ(-1, exitStatusOf(spawn([&] {
