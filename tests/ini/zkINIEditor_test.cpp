@@ -187,6 +187,7 @@ TEST(IniEditorLock, LockIsHeldFromOpenUntilClose) {
     EXPECT_EQ(kBlocked, openResult(throughLink));
     holder.Close();
     EXPECT_FALSE(holder.HasSection(zkStr("s")));
+    EXPECT_EQ(Done, openResult(holder, false, false).first);  // reads without the lock
     ASSERT_EQ(Done, openResult(throughLink).first);
     zkStringBase value;
     EXPECT_EQ(Done, throughLink.GetVal(zkStr("s"), zkStr("k"), value));

@@ -13,7 +13,8 @@
 // the three line ends. header_comment.ini: "[net] ; ..." names net, "[abc"
 // abc; "[a]b]" keeps its inner bracket, "[  ]" is the empty name, a lone "["
 // is no header. short_lines.ini: one character, before or after blanks, is
-// ignored; further "=" belong to the value; ";" inside a line is text.
+// ignored; further "=" belong to the value; ";" inside a line is text; the
+// trailing cut keeps a line's first character, even a vertical tab.
 // In files longer than the pieces Open reads them in, a line end, a CR LF
 // or a run of blank lines split between two pieces, and a line longer than a
 // piece, read as in a short file; each shift of the text puts the piece
