@@ -1,18 +1,67 @@
-// Helpers for the INI tests: a document as readable text, and loading given bytes.
+// Helpers for the INI tests: data files and tables of cases, a document as
+// readable text, loading given bytes, and a save that must rewrite its file
+// in place.
 #ifndef ZK_TESTS_INI_TEST_SUPPORT_H
 #define ZK_TESTS_INI_TEST_SUPPORT_H
 
+#include <linux/capability.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
+#include <cerrno>
+#include <iomanip>
+#include <sstream>
 #include <string>
+#include <vector>
 
 #include "support/zkStringText.h"
 #include "support/zkTempDir.h"
 #include "zkMappedINIFile.h"
 
-inline std::string zkTestData(const std::string& name) {
-    return zkReadFile(std::string(ZK_TEST_DATA_DIR) + "/" + name);
+// The bytes of the file `name` of tests/data or, where there is none, name
+// itself.
+inline std::string zkTestText(const std::string& name) {
+    const std::string path = std::string(ZK_TEST_DATA_DIR) + "/" + name;
+    struct stat st;
+    return stat(path.c_str(), &st) == 0 && S_ISREG(st.st_mode) ? zkReadFile(path) : name;
+}
+
+// The bytes a field stands for: the escapes of a C string literal (\0 \t \n
+// \r \v \f \\ \xHH) are replaced by their bytes.
+inline std::string zkUnescape(const std::string& field) {
+    static const std::string named("0\0t\tn\nr\rv\vf\f", 12);
+    std::string out;
+    for (size_t i = 0; i < field.size(); ++i) {
+        if (field[i] != '\\') {
+            out += field[i];
+        } else if (field[++i] == 'x') {
+            out += static_cast<char>(std::stoi(field.substr(i + 1, 2), nullptr, 16));
+            i += 2;
+        } else {
+            const size_t k = named.find(field[i]);
+            out += k == std::string::npos ? field[i] : named[k + 1];
+        }
+    }
+    return out;
+}
+
+// Calls check(fields) for each row of the table file tests/data/<name>,
+// under a trace naming the file and the row. Blank lines and lines starting
+// with '#' are skipped. Fields are separated by blanks; a field in single
+// quotes may hold blanks ('' is the empty field).
+template <class Check>
+void zkForEachRow(const std::string& name, Check check) {
+    std::istringstream table(zkTestText(name));
+    ASSERT_NE(name, table.str());
+    for (std::string line; std::getline(table, line);) {
+        std::istringstream text(line);
+        std::vector<std::string> fields;
+        for (std::string f; line[0] != '#' && text >> std::quoted(f, '\'', '\0');) fields.push_back(zkUnescape(f));
+        if (fields.empty()) continue;
+        SCOPED_TRACE(name + ": " + line);
+        check(fields);
+    }
 }
 
 // "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
@@ -34,18 +83,33 @@ inline int zkLoad(zkMappedINIFile& ini, const zkTempDir& dir, const std::string&
     return ini.Open(0);
 }
 
-// Runs body under a file size limit of limit bytes as a user who may not
-// write into dir, so that a save rewrites its file in place (root acts as
-// nobody, as permission bits do not stop root); the file must be writable
-// by all. False when that could not be arranged.
+// Sets the calling thread's effective capabilities to none, or back to all
+// it is permitted; false when that could not be done.
+inline bool zkSetEffectiveCapabilities(bool on) {
+    __user_cap_header_struct header = {_LINUX_CAPABILITY_VERSION_3, 0};
+    __user_cap_data_struct data[_LINUX_CAPABILITY_U32S_3] = {};
+    if (syscall(SYS_capget, &header, data) != 0) return false;
+    for (auto& each : data) each.effective = on ? each.permitted : 0;
+    return syscall(SYS_capset, &header, data) == 0;
+}
+
+// Runs body, a save of a file of dir: as it is, or, inPlace, with dir closed
+// to new files, so that the save rewrites the file in place, and with writes
+// past limit bytes failing. Root is held to the permission bits as dir's
+// owner by giving up its capabilities meanwhile (a user switch would need
+// every directory above dir open to that user). False when that could not
+// be arranged.
 template <class Body>
-bool zkInPlaceWithLimit(const zkTempDir& dir, unsigned long long limit, Body body) {
-    const bool root = geteuid() == 0;
-    if (chmod(dir.path().c_str(), 0555) != 0) return false;
-    bool done = !root || seteuid(65534) == 0;
-    done = done && zkWithFileSizeLimit(limit, body);
-    if (root && seteuid(0) != 0) return false;
-    return chmod(dir.path().c_str(), 0755) == 0 && done;
+bool zkSave(const zkTempDir& dir, bool inPlace, unsigned long long limit, Body body) {
+    if (!inPlace) {
+        body();
+        return true;
+    }
+    if (chmod(dir.path().c_str(), 0555) != 0 || !zkSetEffectiveCapabilities(false)) return false;
+    // A directory that could be added to would let the save replace the file.
+    const bool done =
+        mkdir(dir.file("probe").c_str(), 0700) != 0 && errno == EACCES && zkWithFileSizeLimit(limit, body);
+    return zkSetEffectiveCapabilities(true) && chmod(dir.path().c_str(), 0755) == 0 && done;
 }
 
 #endif
