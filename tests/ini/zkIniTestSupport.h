@@ -1,6 +1,5 @@
-// Helpers for the INI tests: data files and tables of cases, a document as
-// readable text, loading given bytes, and a save that must rewrite its file
-// in place.
+// Helpers for the INI tests: data files, a document as readable text,
+// loading given bytes, and a save that must rewrite its file in place.
 #ifndef ZK_TESTS_INI_TEST_SUPPORT_H
 #define ZK_TESTS_INI_TEST_SUPPORT_H
 
@@ -16,6 +15,7 @@
 #include <vector>
 
 #include "support/zkStringText.h"
+#include "support/zkTableFile.h"
 #include "support/zkTempDir.h"
 #include "zkMappedINIFile.h"
 
@@ -25,43 +25,6 @@ inline std::string zkTestText(const std::string& name) {
     const std::string path = std::string(ZK_TEST_DATA_DIR) + "/" + name;
     struct stat st;
     return stat(path.c_str(), &st) == 0 && S_ISREG(st.st_mode) ? zkReadFile(path) : name;
-}
-
-// The bytes a field stands for: the escapes of a C string literal (\0 \t \n
-// \r \v \f \\ \xHH) are replaced by their bytes.
-inline std::string zkUnescape(const std::string& field) {
-    static const std::string named("0\0t\tn\nr\rv\vf\f", 12);
-    std::string out;
-    for (size_t i = 0; i < field.size(); ++i) {
-        if (field[i] != '\\') {
-            out += field[i];
-        } else if (field[++i] == 'x') {
-            out += static_cast<char>(std::stoi(field.substr(i + 1, 2), nullptr, 16));
-            i += 2;
-        } else {
-            const size_t k = named.find(field[i]);
-            out += k == std::string::npos ? field[i] : named[k + 1];
-        }
-    }
-    return out;
-}
-
-// Calls check(fields) for each row of the table file tests/data/<name>,
-// under a trace naming the file and the row. Blank lines and lines starting
-// with '#' are skipped. Fields are separated by blanks; a field in single
-// quotes may hold blanks ('' is the empty field).
-template <class Check>
-void zkForEachRow(const std::string& name, Check check) {
-    std::istringstream table(zkTestText(name));
-    ASSERT_NE(name, table.str());
-    for (std::string line; std::getline(table, line);) {
-        std::istringstream text(line);
-        std::vector<std::string> fields;
-        for (std::string f; line[0] != '#' && text >> std::quoted(f, '\'', '\0');) fields.push_back(zkUnescape(f));
-        if (fields.empty()) continue;
-        SCOPED_TRACE(name + ": " + line);
-        check(fields);
-    }
 }
 
 // "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
