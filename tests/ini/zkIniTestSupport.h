@@ -64,14 +64,15 @@ void zkForEachRow(const std::string& name, Check check) {
     }
 }
 
-// "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
+// "[name]" per section, then "c:text" per comment line (m_isComment 1) and
+// "k:key|value" per other line.
 inline std::string zkDump(zkMappedINIFile& ini) {
     std::string out;
     for (const INISection* section : *ini.GetSectionList()) {
         out += "[" + zkText(section->m_name) + "]\n";
         for (const INILine* line : *section->m_lines)
-            out += line->m_isComment ? "c:" + zkText(line->m_value) + "\n"
-                                     : "k:" + zkText(line->m_key) + "|" + zkText(line->m_value) + "\n";
+            out += line->m_isComment == 1 ? "c:" + zkText(line->m_value) + "\n"
+                                          : "k:" + zkText(line->m_key) + "|" + zkText(line->m_value) + "\n";
     }
     return out;
 }
