@@ -27,14 +27,15 @@ inline std::string zkTestText(const std::string& name) {
     return stat(path.c_str(), &st) == 0 && S_ISREG(st.st_mode) ? zkReadFile(path) : name;
 }
 
-// "[name]" per section, then "k:key|value" per key line and "c:text" per comment.
+// "[name]" per section, then "c:text" per comment line (m_isComment 1) and
+// "k:key|value" per other line.
 inline std::string zkDump(zkMappedINIFile& ini) {
     std::string out;
     for (const INISection* section : *ini.GetSectionList()) {
         out += "[" + zkText(section->m_name) + "]\n";
         for (const INILine* line : *section->m_lines)
-            out += line->m_isComment ? "c:" + zkText(line->m_value) + "\n"
-                                     : "k:" + zkText(line->m_key) + "|" + zkText(line->m_value) + "\n";
+            out += line->m_isComment == 1 ? "c:" + zkText(line->m_value) + "\n"
+                                          : "k:" + zkText(line->m_key) + "|" + zkText(line->m_value) + "\n";
     }
     return out;
 }
