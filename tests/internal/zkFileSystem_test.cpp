@@ -175,17 +175,16 @@ TEST(FileSystem, FailuresGiveOne) {
     zkTempDir dir;
     ASSERT_EQ(0, symlink("loop", dir.file("loop").c_str()));
     ASSERT_TRUE(zkWriteFile(dir.file("f"), "x"));
-    const zkContentWriter writes = [](int fd) { return zkWriteAll(fd, "y", 1) == 0; };
     const zkContentWriter fails = [](int) { return (errno = EIO) == 0; };
     for (const std::string& path : {std::string(), dir.file("f/x"), dir.file("none/x")})
-        EXPECT_EQ(1, zkReplaceFile(path.c_str(), 0644, 0, writes)) << path;
-    EXPECT_EQ(1, zkReplaceFile(nullptr, 0644, 0, writes));
+        EXPECT_EQ(1, zkReplaceFile(path.c_str(), 0644, 0, fails)) << path;
+    EXPECT_EQ(1, zkReplaceFile(nullptr, 0644, 0, fails));
     EXPECT_EQ(1, zkWriteAll(-1, "y", 1));
-    EXPECT_EQ(1, zkReplaceFile(dir.file("loop").c_str(), 0644, 0, writes));
+    EXPECT_EQ(1, zkReplaceFile(dir.file("loop").c_str(), 0644, 0, fails));
     EXPECT_EQ(ELOOP, errno);
     EXPECT_EQ(1, zkReplaceFile(dir.file("f").c_str(), 0644, 0, fails));
     EXPECT_EQ(EIO, errno);
-    EXPECT_EQ(1, zkCreateNewFile(dir.file("f").c_str(), 0644, false, writes));
+    EXPECT_EQ(1, zkCreateNewFile(dir.file("f").c_str(), 0644, false, fails));
     EXPECT_EQ(1, zkCreateNewFile(dir.file("n").c_str(), 0644, true, fails));
     EXPECT_EQ(EIO, errno);
     EXPECT_EQ("x", zkReadFile(dir.file("f")));

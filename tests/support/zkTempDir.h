@@ -86,7 +86,7 @@ template <class Write>
 std::string zkReadFromShortWrites(Write write) {
     struct sigaction action = {}, saved;
     action.sa_handler = [](int) {};  // without SA_RESTART
-    int ends[2];
+    int ends[2], queued = 0;
     if (sigaction(SIGUSR1, &action, &saved) != 0 || pipe2(ends, O_CLOEXEC) != 0) return "";
     const int capacity = fcntl(ends[1], F_GETPIPE_SZ);
     std::atomic<bool> finished{false};
@@ -98,7 +98,6 @@ std::string zkReadFromShortWrites(Write write) {
     std::string got;
     char block[4096];
     for (ssize_t n = 1; n > 0; got.append(block, n > 0 ? static_cast<size_t>(n) : 0)) {
-        int queued = 0;
         while (!finished && ioctl(ends[0], FIONREAD, &queued) == 0 && queued < capacity) usleep(100);
         if (!finished) pthread_kill(writer.native_handle(), SIGUSR1);
         n = read(ends[0], block, sizeof block);
