@@ -94,12 +94,11 @@ struct Sandbox {
 };
 
 // A write may fail at any offset (every one near the ends and a stride
-// between, for a plain or private file and in place), beside the file or in
-// place: the old bytes and mode stay, and nothing else is left in the
+// between, for the private file and in place), beside the file or in place:
+// the old bytes, mode and group stay, and nothing else is left in the
 // directory. A whole write leaves the new bytes under the old mode and
-// group, in the file a link leads to (so the link stays). With
-// umask 000, no new file grants more than the old one from the moment it
-// appears: another process looks at each while the replace runs.
+// group, in the file a link leads to (so the link stays). With umask 000, no
+// new file grants more than the old one from the moment it appears.
 TEST(SafeReplace, FailedReplaceKeepsTheOldFile) {
     for (bool copy : {false, true}) {
         for (const Target& t : kTargets) {

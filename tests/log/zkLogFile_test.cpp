@@ -9,8 +9,8 @@
 
 // A line is the entry number and ") " when asked for, the local time
 // "HH:MM:SS MM/DD/YY" (on by default), two blanks and the message; the
-// constructor clears the file first. The zone makes the hour 10, whose tens
-// digit a wrong divisor would lose.
+// constructor clears the file first. The zone is chosen so that the hour
+// reads 10, which has a tens digit to lose.
 TEST(LogFile, LineFormat) {
     zkTempDir dir;
     ASSERT_TRUE(zkWriteFile(dir.file("app.log"), "old\n"));
@@ -28,12 +28,12 @@ TEST(LogFile, LineFormat) {
 }
 
 // The option words start as 0, 1 and 0. Only entries at or below the log's
-// level (1 at first) are written and numbered, their messages verbatim; a two-part message starts afresh each
-// time. A new file name turns the reserved option word back to 0, and the
-// counter goes on; a nonzero clear deletes the file of that name, but never
-// a folder. The echo goes to standard output at once, for the next written
-// entry only, whether or not the file can be written; a failed write leaves
-// the file as it was.
+// level (1 at first) are written and numbered, their messages verbatim; a
+// two-part message starts afresh each time. A new file name turns the
+// reserved option word back to 0, and the counter goes on; a nonzero clear
+// deletes the file of that name, but never a folder. The echo goes to
+// standard output at once, for the next written entry only, whether or not
+// the file can be written; a failed write leaves the file as it was.
 TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
     zkTempDir dir;
     for (const char* name : {"m.log", "n.log"}) ASSERT_TRUE(zkWriteFile(dir.file(name), "kept\n"));
