@@ -99,10 +99,13 @@ int takeOverMode(int fd, const struct stat& old) {
     return zkSystem.fchmod(fd, old.st_mode & kPermissionBits) == 0 ? 0 : 1;
 }
 
-// Writes through fd, flushes it when sync and closes it: 0, or 1 with errno
-// (fd closed either way).
-int writeAndClose(int fd, const zkContentWriter& write, bool sync) {
+// Writes through fd, gives it old's owner and mode when old is given, flushes
+// it when sync and closes it: 0, or 1 with errno (fd closed either way). The
+// mode comes after the bytes: a write by a process without CAP_FSETID clears
+// the set-id bits.
+int writeAndClose(int fd, const zkContentWriter& write, const struct stat* old, bool sync) {
     if (!write(fd)) return fail(fd);
+    if (old && takeOverMode(fd, *old) != 0) return fail(fd);
     if (sync && zkSystem.fsync(fd) != 0) return fail(fd);
     return closeChecked(fd);
 }
@@ -125,7 +128,7 @@ Outcome replaceBeside(const std::string& target, const struct stat* old, mode_t 
     std::string temp;
     int fd = createBeside(target, old ? kPrivateMode : newMode, temp);
     if (fd == -1) return refusedHere(errno) ? Outcome::NotHere : Outcome::Failed;
-    int failed = old && takeOverMode(fd, *old) != 0 ? fail(fd) : writeAndClose(fd, write, old != nullptr);
+    int failed = writeAndClose(fd, write, old, old != nullptr);
     if (!failed && zkSystem.rename(temp.c_str(), target.c_str()) != 0) failed = refusedHere(errno) ? 2 : 1;
     if (failed) {
         zkErrnoKeeper keep;
@@ -187,6 +190,9 @@ int rewriteInPlace(const std::string& target, unsigned long long sizeHint, const
         }
     }
     bool written = write(fd);
+    // The write cleared the set-id bits unless the process may keep them;
+    // where it may not set them either, they stay cleared.
+    if (written && (st.st_mode & (S_ISUID | S_ISGID)) != 0) (void)zkSystem.fchmod(fd, st.st_mode & kPermissionBits);
     off_t end = written ? lseek(fd, 0, SEEK_CUR) : -1;
     if (end == -1 || zkSystem.ftruncate(fd, end) != 0 || zkSystem.fsync(fd) != 0) {
         restore(fd, old);
@@ -280,7 +286,7 @@ int zkReplaceFile(const char* path, mode_t newMode, unsigned long long sizeHint,
 int zkCreateNewFile(const char* path, mode_t mode, bool sync, const zkContentWriter& write) {
     int fd = zkOpen(path, O_CREAT | O_EXCL | O_WRONLY, mode);
     if (fd == -1) return 1;
-    if (writeAndClose(fd, write, sync) == 0) return 0;
+    if (writeAndClose(fd, write, nullptr, sync) == 0) return 0;
     zkErrnoKeeper keep;
     unlink(path);
     return 1;

@@ -93,9 +93,9 @@ void zkSyncDirectoryOf(const std::string& path);
 //
 // An existing regular file: the contents go to a new file beside it, made
 // exclusively with mode 0600 under a name that fits one path component,
-// given the old file's owner and group (where the process may) and then its
-// permission bits, set-id bits included, through the descriptor before any
-// byte is written; the new file is flushed, renamed over the old one and the
+// written, then given the old file's owner and group (where the process may)
+// and its permission bits, set-id bits included, through the descriptor, so
+// that it is private until it is whole; the new file is flushed, renamed over the old one and the
 // directory flushed. Where no file can be made or renamed beside it and the
 // process may write the old file, it is rewritten in place so that a
 // failure writes the old bytes back. sizeHint (0: unknown) is the size the
