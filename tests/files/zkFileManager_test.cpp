@@ -8,14 +8,13 @@
 // same string as any argument. Backslashes become the chosen separator,
 // or '/' when asked.
 TEST(MakePath, JoinsDirectoryAndName) {
-    for (const auto& row : zkCases("files_makepath.txt")) {
-        SCOPED_TRACE(testing::PrintToString(row));
+    zkForEachCase("files_makepath.txt", [&](const zkRow& row) {
         zkStringBase path("stale");
         zkFileManager::m_slash = row.size() > 4 ? row[4][0] : '/';
         zkFileManager::MakePath(path, zkStr(row[0]), zkStr(row[1]), std::stoul(row[2]));
         zkFileManager::m_slash = '/';
         EXPECT_EQ(row[3], zkText(path));
-    }
+    });
     zkStringBase dir("/a"), name("b"), file("\\a\\..\\b"), mixed("a\\b/c");
     zkFileManager::MakePath(dir, dir, name, 1u);
     EXPECT_EQ("/a/b", zkText(dir));

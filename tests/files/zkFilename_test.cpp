@@ -14,14 +14,13 @@ TEST(Filename, PartsOfAPath) {
     using Setter = void (zkFilename::*)(const char*);
     const std::map<std::string, Setter> setters = {
         {"name", &zkFilename::SetName}, {"ext", &zkFilename::SetExtension}, {"dir", &zkFilename::SetDirectory}};
-    for (const auto& row : zkCases("files_names.txt")) {
-        SCOPED_TRACE(testing::PrintToString(row));
+    zkForEachCase("files_names.txt", [&](const zkRow& row) {
         zkFilename f(row[0].c_str());
         if (!row[1].empty()) (f.*setters.at(row[1]))(row[2].c_str());
         EXPECT_EQ(row[3], parts(f));
         EXPECT_EQ(row[3], parts(zkFilename(f)));
         EXPECT_EQ(row[3], parts(zkFilename("/old/name.ext") = f));
-    }
+    });
     // Parts set directly: a directory without its separator, and a name
     // holding a directory part of its own.
     zkFilename direct;

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "support/zkStringText.h"
+#include "support/zkTableFile.h"
 #include "support/zkTempDir.h"
 #include "zkBasicFile.h"
 #include "zkFileManager.h"
@@ -53,21 +54,16 @@ inline std::string zkTree(const std::string& dir, const std::string& prefix = ""
     return out;
 }
 
-// The cases of tests/data/<name>: one a line, its fields split at spaces,
-// "-" standing for an empty field; lines starting with '#' are comments.
+// Calls check(fields) for each row of tests/data/<name>, read as
+// zkForEachRow reads it, with "-" standing for an empty field.
 using zkRow = std::vector<std::string>;
 
-inline std::vector<zkRow> zkCases(const std::string& name) {
-    std::ifstream in(std::string(ZK_TEST_DATA_DIR) + "/" + name);
-    std::vector<zkRow> rows;
-    for (std::string line; std::getline(in, line);) {
-        std::istringstream fields(line);
-        zkRow row;
-        for (std::string field; fields >> field;) row.push_back(field == "-" ? "" : field);
-        if (!row.empty() && row[0][0] != '#') rows.push_back(row);
-    }
-    EXPECT_FALSE(rows.empty()) << name;
-    return rows;
+template <class Check>
+void zkForEachCase(const std::string& name, Check check) {
+    zkForEachRow(name, [&](zkRow row) {
+        for (std::string& field : row) field = field == "-" ? "" : field;
+        check(row);
+    });
 }
 
 // The fields of row from index `from` on, each followed by a space.
@@ -132,7 +128,7 @@ inline void zkStep(const zkRow& row) {
     }
 }
 
-// Runs the steps of tests/data/<name>, read as zkCases reads it, in a new
+// Runs the steps of tests/data/<name>, read as zkForEachCase reads it, in a new
 // temporary directory that is the current directory meanwhile. A step is a
 // verb and its fields:
 //   plant ENTRIES...          makes the entries as zkPlant does
@@ -155,13 +151,12 @@ inline void zkRunSteps(const std::string& name) {
     const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     ASSERT_EQ(0, chdir(dir.path().c_str()));
     const mode_t mask = umask(0);
-    for (const zkRow& row : zkCases(name)) {
-        SCOPED_TRACE(testing::PrintToString(row));
+    zkForEachCase(name, [](const zkRow& row) {
         const int next = dup(0);  // the lowest free descriptor, free again after each step
         close(next);
         zkStep(row);
         EXPECT_EQ(-1, fcntl(next, F_GETFD)) << "a descriptor was left open";
-    }
+    });
     EXPECT_EQ(0, fchdir(home));
     close(home);
     umask(mask);
