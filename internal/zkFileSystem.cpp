@@ -14,6 +14,7 @@
 zkSystemCalls zkSystem = {
     [](const char* path, int flags, mode_t mode) { return ::open(path, flags, mode); },
     ::close,
+    ::read,
     ::write,
     [](int fd, void* data, size_t size, off_t offset) { return ::pread(fd, data, size, offset); },
     [](int fd, const void* data, size_t size, off_t offset) { return ::pwrite(fd, data, size, offset); },

@@ -21,13 +21,15 @@
 #include <memory>
 #include <string>
 
-// The system calls through which this boundary reads, writes, flushes and
-// renames files, gathered in one table: the library uses the real calls, and
-// a test may replace an entry to make that call fail. allocate answers like
-// posix_fallocate (0 or an error number); the others like the calls they name.
+// The system calls through which this boundary, and the platform layer's
+// ReadFile and WriteFile, read, write, flush and rename files, gathered in
+// one table: the library uses the real calls, and a test may replace an entry
+// to make that call fail. allocate answers like posix_fallocate (0 or an
+// error number); the others like the calls they name.
 struct zkSystemCalls {
     int (*open)(const char* path, int flags, mode_t mode);
     int (*close)(int fd);
+    ssize_t (*read)(int fd, void* data, size_t size);
     ssize_t (*write)(int fd, const void* data, size_t size);
     ssize_t (*pread)(int fd, void* data, size_t size, off_t offset);
     ssize_t (*pwrite)(int fd, const void* data, size_t size, off_t offset);

@@ -52,7 +52,7 @@ int CreateFile(const char* path, unsigned flags, unsigned, unsigned, unsigned cr
 int ReadFile(int handle, void* buffer, unsigned count, unsigned* done, void*) {
     ssize_t n;
     do {
-        n = read(handle, buffer, count);
+        n = zkSystem.read(handle, buffer, count);
     } while (n == -1 && errno == EINTR);
     if (done) *done = n < 0 ? 0 : static_cast<unsigned>(n);
     return n >= 0;
@@ -62,7 +62,7 @@ int WriteFile(int handle, const void* buffer, unsigned count, unsigned* done, vo
     const char* bytes = static_cast<const char*>(buffer);
     unsigned written = 0;
     while (written < count) {
-        ssize_t n = write(handle, bytes + written, count - written);
+        ssize_t n = zkSystem.write(handle, bytes + written, count - written);
         if (n == -1 && errno == EINTR) continue;
         // A write that takes nothing would repeat forever: count it as a failure.
         if (n <= 0) break;

@@ -66,42 +66,6 @@ TEST(HandleFiles, ResultsOfEachCall) {
     EXPECT_EQ(0xFFFFFFFFu, GetFileSize(in, nullptr));
 }
 
-// An interrupted call goes on: one interrupted before it moved a byte is
-// made again, and each write cut short goes on from where it stopped.
-TEST(HandleFiles, InterruptedCallsGoOn) {
-    if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking call as the kernel does";
-    static int ends[2], signals;
-    static char block[1 << 16];
-    signals = 0;
-    // Without SA_RESTART. The first signal gives the waiting read its byte,
-    // the second makes room for the waiting write.
-    struct sigaction action = {}, saved;
-    action.sa_handler = [](int) { (void)!(signals++ ? read(ends[0], block, sizeof block) : write(ends[1], "x", 1)); };
-    ASSERT_EQ(0, sigaction(SIGALRM, &action, &saved));
-    ASSERT_EQ(0, pipe2(ends, O_CLOEXEC));
-    char byte = 0;
-    unsigned done = 0;
-    ualarm(50000, 0);
-    ASSERT_EQ(1, ReadFile(ends[0], &byte, 1, &done, nullptr));
-    EXPECT_EQ(1u, done);
-    const std::string fill(static_cast<size_t>(fcntl(ends[1], F_GETPIPE_SZ)), 'f');
-    EXPECT_EQ(static_cast<ssize_t>(fill.size()), write(ends[1], fill.data(), fill.size()));
-    ualarm(50000, 0);
-    EXPECT_EQ(1, WriteFile(ends[1], "y", 1, &done, nullptr));
-    close(ends[0]);
-    close(ends[1]);
-    sigaction(SIGALRM, &saved, nullptr);
-
-    std::string data((1 << 19) + 1000, '\0');  // not a whole number of blocks
-    for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
-    int result = 0;
-    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) {
-                  result = WriteFile(fd, data.data(), static_cast<unsigned>(data.size()), &done, nullptr);
-              }));
-    EXPECT_EQ(1, result);
-    EXPECT_EQ(data.size(), done);
-}
-
 // Names in byte order; a copy goes on from the same name on its own. The
 // directory is read once and closed.
 TEST(DirIterator, ListsMatchingNamesInOrder) {

@@ -2,81 +2,18 @@
 // failed replace leaves the old bytes, owner and group, no other file and no
 // open descriptor, and reports the failing call's errno; an interrupted call
 // is retried; a refused rename falls back to rewriting in place.
-#include <dirent.h>
-#include <fcntl.h>
-#include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <string>
-#include <type_traits>
 
-#include "internal/zkFileSystem.h"
-#include "support/zkTempDir.h"
+#include "support/zkFaults.h"
 
 namespace {
 
-const zkSystemCalls kRealCalls = zkSystem;
 const std::string kOld = "old bytes\n";
 const std::string kNew = "the new bytes, longer than the old\n";
 constexpr gid_t kOtherGroup = 65534;
-
-// How one entry misbehaves: its nth call (0: every call) answers result with
-// errno set to error; the other calls reach the real one.
-struct Fault {
-    long nth, result;
-    int error;
-};
-
-// Calls whose failure may come after they took effect: Linux releases the
-// descriptor even when close reports a failure, and a reservation that runs
-// out of space may already have made the file longer.
-template <auto Entry>
-constexpr bool kTakesEffectFirst = false;
-template <>
-constexpr bool kTakesEffectFirst<&zkSystemCalls::close> = true;
-template <>
-constexpr bool kTakesEffectFirst<&zkSystemCalls::allocate> = true;
-
-template <auto Entry, typename Call = std::remove_reference_t<decltype(zkSystem.*Entry)>>
-struct Faulty;
-
-template <auto Entry, typename R, typename... A>
-struct Faulty<Entry, R (*)(A...)> {
-    static inline Fault fault;
-    static inline long calls;
-    static R call(A... args) {
-        ++calls;
-        if (fault.nth != 0 && fault.nth != calls) return (kRealCalls.*Entry)(args...);
-        if constexpr (kTakesEffectFirst<Entry>) (kRealCalls.*Entry)(args...);
-        errno = fault.error;
-        return static_cast<R>(fault.result);
-    }
-    static void arm(Fault f) {
-        fault = f;
-        calls = 0;
-        zkSystem.*Entry = &call;
-    }
-};
-
-using Arm = void (*)(Fault);
-#define ZK_FAULTY(entry) &Faulty<&zkSystemCalls::entry>::arm
-
-// Reads and writes at an offset that move at most three bytes a call.
-void armShortTransfers(Fault) {
-    zkSystem.pread = [](int fd, void* data, size_t size, off_t at) {
-        return kRealCalls.pread(fd, data, size < 3 ? size : 3, at);
-    };
-    zkSystem.pwrite = [](int fd, const void* data, size_t size, off_t at) {
-        return kRealCalls.pwrite(fd, data, size < 3 ? size : 3, at);
-    };
-}
-
-// One call made to misbehave.
-struct Step {
-    Arm arm;
-    Fault fault;
-};
 
 const Step kRenameRefused = {ZK_FAULTY(rename), {0, -1, EACCES}};  // the directory admits no new file
 
@@ -110,8 +47,9 @@ const Row kRows[] = {
     {"in place: write fails", {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}}, EIO},
     {"in place: cut fails", {kRenameRefused, {ZK_FAULTY(ftruncate), {1, -1, EIO}}}, EIO},
     {"in place: flush fails", {kRenameRefused, {ZK_FAULTY(fsync), {2, -1, EIO}}}, EIO},
-    {"in place: short reads", {kRenameRefused, {armShortTransfers, {}}}, 0},
-    {"in place: short restore", {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}, {armShortTransfers, {}}}, EIO},
+    {"in place: short reads and writes", {{armShortTransfers, {}}, kRenameRefused}, 0},
+    // 12 short writes beside, then 3 bytes in place before the failure
+    {"in place: short restore", {{armShortTransfers, {}}, kRenameRefused, {ZK_FAULTY(write), {14, -1, EIO}}}, EIO},
     {"in place: restore interrupted",
      {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}, {ZK_FAULTY(pwrite), {1, -1, EINTR}}},
      EIO},
@@ -125,11 +63,7 @@ bool writeNew(int fd) {
     return zkWriteAll(fd, kNew.data(), kNew.size()) == 0;
 }
 
-class FileSystemFault : public ::testing::Test {
-protected:
-    void TearDown() override { zkSystem = kRealCalls; }
-    zkTempDir m_dir;
-};
+using FileSystemFault = zkFaultTest;
 
 TEST_F(FileSystemFault, OneFailingCallLeavesTheOldFileWhole) {
     for (const Row& row : kRows) {
@@ -142,9 +76,7 @@ TEST_F(FileSystemFault, OneFailingCallLeavesTheOldFileWhole) {
         struct stat before, after;
         ASSERT_EQ(0, stat(target.c_str(), &before));
         const size_t descriptors = openDescriptors();
-        zkSystem = kRealCalls;
-        for (const Step& step : row.steps)
-            if (step.arm != nullptr) step.arm(step.fault);
+        zkArm(row.steps);
         errno = 0;
         const int result = zkReplaceFile(link.c_str(), 0644, kNew.size(), writeNew);
         const int error = errno;
@@ -171,8 +103,7 @@ TEST_F(FileSystemFault, FailedNewFileIsRemoved) {
     } rows[] = {{"flush fails", ZK_FAULTY(fsync)}, {"close fails", ZK_FAULTY(close)}};
     for (const auto& row : rows) {
         SCOPED_TRACE(row.name);
-        zkSystem = kRealCalls;
-        row.arm({1, -1, EIO});
+        zkArm({{row.arm, {1, -1, EIO}}});
         errno = 0;
         EXPECT_EQ(1, zkCreateNewFile(m_dir.file("new").c_str(), 0644, true, writeNew));
         EXPECT_EQ(EIO, errno);
@@ -192,8 +123,7 @@ TEST_F(FileSystemFault, DeviceFailuresAreReportedButAnUnsupportedFlushIsNot) {
                 {"flush succeeds, errno stale", ZK_FAULTY(fsync), {1, 0, EIO}, 0}};
     for (const auto& row : rows) {
         SCOPED_TRACE(row.name);
-        zkSystem = kRealCalls;
-        row.arm(row.fault);
+        zkArm({{row.arm, row.fault}});
         errno = 0;
         EXPECT_EQ(row.result, zkReplaceFile("/dev/null", 0644, 0, writeNew));
         EXPECT_EQ(row.fault.error, errno);

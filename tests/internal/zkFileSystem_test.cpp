@@ -137,13 +137,6 @@ TEST(SafeReplace, InPlaceCopyOfAnEmptyOrShortSource) {
     EXPECT_EQ("x", zkReadFile(box.real));
 }
 
-TEST(FileSystem, WriteAllGoesOnAfterShortWrites) {
-    if (zkUnderEmulator()) GTEST_SKIP() << "the emulator cannot interrupt a blocking write as the kernel does";
-    std::string data((1 << 19) + 1000, '\0');  // not a whole number of blocks
-    for (size_t i = 0; i < data.size(); ++i) data[i] = static_cast<char>(i % 251);
-    EXPECT_EQ(data, zkReadFromShortWrites([&](int fd) { EXPECT_EQ(0, zkWriteAll(fd, data.data(), data.size())); }));
-}
-
 // Relative targets are relative to the link's directory; a chain longer
 // than the kernel follows fails with ELOOP.
 TEST(FileSystem, ResolveLinksFollowsToTheFileItself) {

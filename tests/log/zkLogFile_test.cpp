@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <ctime>
+#include <thread>
 
 #include "support/zkTempDir.h"
 #include "zkLogFile.h"
