@@ -155,9 +155,16 @@ bool readAll(int fd, std::vector<char>& bytes, size_t size) {
     return true;
 }
 
-// Puts the old bytes and length back after a failed rewrite. They fitted
-// before, so no new room is needed for them.
-void restore(int fd, const std::vector<char>& old) {
+// Writes and cuts by a process that may not keep the set-id bits clear
+// them; the owner may set them again. Where the process may not, they stay
+// cleared.
+void giveBackSetIdBits(int fd, const struct stat& old) {
+    if ((old.st_mode & (S_ISUID | S_ISGID)) != 0) (void)zkSystem.fchmod(fd, old.st_mode & kPermissionBits);
+}
+
+// Puts the old bytes, length and set-id bits back after a failed rewrite.
+// The bytes fitted before, so no new room is needed for them.
+void restore(int fd, const std::vector<char>& old, const struct stat& st) {
     zkErrnoKeeper keep;
     size_t put = 0;
     while (put < old.size()) {
@@ -167,6 +174,7 @@ void restore(int fd, const std::vector<char>& old) {
         put += static_cast<size_t>(n);
     }
     (void)zkSystem.ftruncate(fd, static_cast<off_t>(old.size()));
+    giveBackSetIdBits(fd, st);
     (void)zkSystem.fsync(fd);
 }
 
@@ -186,17 +194,15 @@ int rewriteInPlace(const std::string& target, unsigned long long sizeHint, const
         // EINVAL; the write then finds out.
         if (error != 0 && error != EOPNOTSUPP && error != EINVAL) {
             errno = error;
-            restore(fd, old);
+            restore(fd, old, st);
             return fail(fd);
         }
     }
-    bool written = write(fd);
-    // The write cleared the set-id bits unless the process may keep them;
-    // where it may not set them either, they stay cleared.
-    if (written && (st.st_mode & (S_ISUID | S_ISGID)) != 0) (void)zkSystem.fchmod(fd, st.st_mode & kPermissionBits);
-    off_t end = written ? lseek(fd, 0, SEEK_CUR) : -1;
-    if (end == -1 || zkSystem.ftruncate(fd, end) != 0 || zkSystem.fsync(fd) != 0) {
-        restore(fd, old);
+    off_t end = write(fd) ? lseek(fd, 0, SEEK_CUR) : -1;
+    bool cut = end != -1 && zkSystem.ftruncate(fd, end) == 0;
+    if (cut) giveBackSetIdBits(fd, st);
+    if (!cut || zkSystem.fsync(fd) != 0) {
+        restore(fd, old, st);
         return fail(fd);
     }
     return closeChecked(fd);

@@ -193,4 +193,17 @@ TEST(IniSave, OnlyASuccessfulSaveChangesTheFile) {
             EXPECT_EQ(old, zkReadFile(dir.file("a.ini")));
         }
     });
+    // A write that fails, beside the file or in place.
+    for (bool inPlace : {false, true}) {
+        SCOPED_TRACE(inPlace ? "in place" : "beside");
+        zkMappedINIFile ini;
+        ASSERT_EQ(0, zkLoad(ini, dir, "a.ini", old));
+        ini.SetVal(zkStr("s"), zkStr("k"), zkStr(std::string(100, 'n')));
+        const std::string kept = zkDump(ini);
+        int result = 0;
+        ASSERT_TRUE(zkSave(dir, inPlace, 20, [&] { result = ini.Close(1); }));
+        EXPECT_EQ(1, result);
+        EXPECT_EQ(kept, zkDump(ini));
+        EXPECT_EQ(old, zkReadFile(dir.file("a.ini")));
+    }
 }

@@ -78,10 +78,10 @@ struct Step {
     Fault fault;
 };
 
-// Puts the real calls in place and arms steps (empty ones skipped).
+// Puts the calls of base in place and arms steps (empty ones skipped).
 template <size_t N>
-void zkArm(const Step (&steps)[N]) {
-    zkSystem = kRealCalls;
+void zkArm(const Step (&steps)[N], const zkSystemCalls& base = kRealCalls) {
+    zkSystem = base;
     for (const Step& step : steps)
         if (step.arm != nullptr) step.arm(step.fault);
 }

@@ -1,13 +1,17 @@
 // Test helpers: a temporary directory that removes itself, whole-file reads
-// and writes for comparing exact bytes, directory listings, and a file size
-// limit for provoking failed writes.
+// and writes for comparing exact bytes, directory listings, a file size
+// limit for provoking failed writes, and a save made to rewrite its file in
+// place as a user without privilege would.
 #pragma once
 
 #include <errno.h>
 #include <fcntl.h>
+#include <linux/capability.h>
 #include <signal.h>
 #include <stdlib.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <filesystem>
@@ -66,4 +70,30 @@ bool zkWithFileSizeLimit(unsigned long long bytes, Body body) {
     setrlimit(RLIMIT_FSIZE, &saved);
     signal(SIGXFSZ, handler);
     return set;
+}
+
+// Sets the calling thread's effective capabilities to none, or back to all
+// it is permitted; false when that could not be done.
+inline bool zkSetEffectiveCapabilities(bool on) {
+    __user_cap_header_struct header = {_LINUX_CAPABILITY_VERSION_3, 0};
+    __user_cap_data_struct data[_LINUX_CAPABILITY_U32S_3] = {};
+    if (syscall(SYS_capget, &header, data) != 0) return false;
+    for (auto& each : data) each.effective = on ? each.permitted : 0;
+    return syscall(SYS_capset, &header, data) == 0;
+}
+
+// Runs body, a save of a file of dir, with writes past limit bytes failing:
+// as it is, or, inPlace, with dir closed to new files, so that the save
+// rewrites the file in place. Root is held to the permission bits as dir's
+// owner by giving up its capabilities meanwhile (a user switch would need
+// every directory above dir open to that user). False when that could not
+// be arranged.
+template <class Body>
+bool zkSave(const zkTempDir& dir, bool inPlace, unsigned long long limit, Body body) {
+    if (!inPlace) return zkWithFileSizeLimit(limit, body);
+    if (chmod(dir.path().c_str(), 0555) != 0 || !zkSetEffectiveCapabilities(false)) return false;
+    // A directory that could be added to would let the save replace the file.
+    const bool done =
+        mkdir(dir.file("probe").c_str(), 0700) != 0 && errno == EACCES && zkWithFileSizeLimit(limit, body);
+    return zkSetEffectiveCapabilities(true) && chmod(dir.path().c_str(), 0755) == 0 && done;
 }
