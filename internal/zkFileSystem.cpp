@@ -22,6 +22,7 @@ zkSystemCalls zkSystem = {
     [](int fd, off_t length) { return ::ftruncate(fd, length); },
     [](int fd, off_t offset, off_t length) { return ::posix_fallocate(fd, offset, length); },
     ::rename,
+    ::mkdir,
     ::readlink,
     ::fchown,
     ::fchmod,

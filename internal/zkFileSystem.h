@@ -22,10 +22,11 @@
 #include <string>
 
 // The system calls through which this boundary, and the platform layer's
-// ReadFile and WriteFile, read, write, flush and rename files, gathered in
-// one table: the library uses the real calls, and a test may replace an entry
-// to make that call fail. allocate answers like posix_fallocate (0 or an
-// error number); the others like the calls they name.
+// ReadFile, WriteFile and zkCreateDir, read, write, flush, rename and make
+// files, gathered in one table: the library uses the real calls, and a test
+// may replace an entry to make that call fail or count it. allocate answers
+// like posix_fallocate (0 or an error number); the others like the calls
+// they name.
 struct zkSystemCalls {
     int (*open)(const char* path, int flags, mode_t mode);
     int (*close)(int fd);
@@ -37,6 +38,7 @@ struct zkSystemCalls {
     int (*ftruncate)(int fd, off_t length);
     int (*allocate)(int fd, off_t offset, off_t length);
     int (*rename)(const char* from, const char* to);
+    int (*mkdir)(const char* path, mode_t mode);
     ssize_t (*readlink)(const char* path, char* target, size_t size);
     int (*fchown)(int fd, uid_t owner, gid_t group);
     int (*fchmod)(int fd, mode_t mode);

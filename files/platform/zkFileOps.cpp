@@ -25,7 +25,7 @@ int zkCreateDir(const char* path, void* attributes) {
     // test.
     std::string partial(path);
     size_t end = partial.size();
-    while (mkdir(partial.substr(0, end).c_str(), mode) != 0 && errno == ENOENT) {
+    while (zkSystem.mkdir(partial.substr(0, end).c_str(), mode) != 0 && errno == ENOENT) {
         size_t slash = partial.rfind(kZkPathSeparator, end - 1);
         while (slash != std::string::npos && slash > 0 && partial[slash - 1] == kZkPathSeparator) --slash;
         if (slash == std::string::npos || slash == 0) break;
@@ -34,7 +34,7 @@ int zkCreateDir(const char* path, void* attributes) {
     while (end < partial.size()) {
         end = partial.find(kZkPathSeparator, end + 1);
         if (end == std::string::npos) end = partial.size();
-        if (partial[end - 1] != kZkPathSeparator) mkdir(partial.substr(0, end).c_str(), mode);
+        if (partial[end - 1] != kZkPathSeparator) zkSystem.mkdir(partial.substr(0, end).c_str(), mode);
     }
     return zkFilename::IsDirectory(path);
 }
