@@ -28,6 +28,8 @@ TEST(Filename, PartsOfAPath) {
     zkFilename::Dup(&direct.m_fname, "s/b", -1);
     direct.Rebuild(0, 0, 0, 0, 0);
     EXPECT_EQ("/d/s/b=/d/s/|b||file", parts(direct));
+    // A length of 0 copies nothing.
+    EXPECT_STREQ("", zkFilename::Dup(&direct.m_ext, "ext", 0));
 }
 
 TEST(Filename, TypeOnDisk) {
