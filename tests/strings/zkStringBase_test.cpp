@@ -229,6 +229,7 @@ TEST(StringSearch, SearchesStopAtTheirBounds) {
     EXPECT_EQ(Bad, zkStr("").rfind('a'));
     // Bytes past the length, here left behind by cut, are never searched.
     EXPECT_EQ(Bad, zkStr("hello").cut(2).find('o', 1));
+    EXPECT_EQ(Bad, zkStr("hello").cut(2).rfind("hel\0o", Bad, 5, true));
 }
 
 // The long search finds what the short one finds, shifted by the filler, and
