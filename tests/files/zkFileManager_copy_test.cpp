@@ -101,6 +101,17 @@ TEST(FileManagerCopy, InPlaceCopyOfAnEmptyOrShortSource) {
     EXPECT_EQ("x", zkReadFile(target));
 }
 
+// A move whose source cannot be removed fails, and the copy stays.
+TEST(FileManagerCopy, MoveFailsWhenTheSourceCannotGo) {
+    zkTempDir from, to;
+    ASSERT_TRUE(zkWriteFile(from.file("a"), "x"));
+    int result = 0;
+    ASSERT_TRUE(zkSave(from, true, RLIM_INFINITY, [&] { result = copyFile(from.file("a"), to.file("a"), 0, 0, 1); }));
+    EXPECT_EQ(1, result);
+    EXPECT_EQ("x", zkReadFile(from.file("a")));
+    EXPECT_EQ("x", zkReadFile(to.file("a")));
+}
+
 // Folders of 200 bytes and one to make up the rest reach a deepest path of
 // exactly 4095 bytes, the longest a path may be, from any temporary
 // directory; a folder "d" below it is past the limit. The chain is made and

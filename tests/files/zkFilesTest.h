@@ -5,6 +5,7 @@
 #define ZK_TESTS_FILES_TEST_H
 
 #include <sys/stat.h>
+#include <sys/sysmacros.h>
 
 #include <algorithm>
 #include <vector>
@@ -17,7 +18,8 @@
 
 // Makes the entries of layout below dir, in order, written as zkTree writes
 // them: "name/" a folder, "name->target" a symbolic link, "name=text" a file;
-// also "name=>other" a hard link to the entry other, and "name|" a FIFO.
+// also "name=>other" a hard link to the entry other, "name|" a FIFO and
+// "name%" a device that takes no writes, as /dev/full.
 inline void zkPlant(const std::string& dir, const std::string& layout) {
     std::istringstream entries(layout);
     for (std::string entry; entries >> entry;) {
@@ -31,6 +33,8 @@ inline void zkPlant(const std::string& dir, const std::string& layout) {
             ASSERT_TRUE(zkWriteFile(path, entry.substr(text + 1))) << entry;
         else if (entry.back() == '|')
             ASSERT_EQ(0, mkfifo(path.substr(0, path.size() - 1).c_str(), 0666)) << entry;
+        else if (entry.back() == '%')
+            ASSERT_EQ(0, mknod(path.substr(0, path.size() - 1).c_str(), S_IFCHR | 0666, makedev(1, 7))) << entry;
         else
             ASSERT_EQ(0, mkdir(path.c_str(), 0777)) << entry;
     }

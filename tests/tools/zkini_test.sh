@@ -176,9 +176,11 @@ status)
     run 3 "$@" -file:a.ini -set -section:s -key:k -value:v -out:missing/c.ini
     same err.txt 'zkini: cannot save missing/c.ini: No such file or directory
 '
-    run 3 "$@" -file:a.ini -set -section:s -key:k -value:v -out:/dev/full
-    says 'cannot save /dev/full: No space left on device'
-    "$@" -file:a.ini -list >/dev/full 2>err.txt
+    # A node of its own, so that a faulty save could never take /dev/full.
+    mknod full c 1 7 || fail "no device node can be made here"
+    run 3 "$@" -file:a.ini -set -section:s -key:k -value:v -out:full
+    says 'cannot save full: No space left on device'
+    "$@" -file:a.ini -list >full 2>err.txt
     [ $? -eq 3 ] || fail "output into a full disk did not exit 3"
     says 'cannot write standard output: No space left on device'
     unchanged
