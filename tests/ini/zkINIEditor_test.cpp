@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <chrono>
 #include <cstring>
 #include <list>
 #include <thread>
@@ -139,7 +140,11 @@ TEST(IniEditorLock, LockIsHeldFromOpenUntilClose) {
     zkINIEditor holder(link.c_str()), direct(path.c_str()), throughLink(link.c_str());
     ASSERT_EQ(Done, holder.Open(false, true));
     EXPECT_EQ(Done, openResult(holder).first);  // the holder's own lock does not block it
+    const auto start = std::chrono::steady_clock::now();
     EXPECT_EQ(kBlocked, openResult(direct));
+    // The wait of 30 ms is spent, and not much more.
+    EXPECT_GE(std::chrono::steady_clock::now() - start, std::chrono::milliseconds(30));
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::milliseconds(900));
     EXPECT_EQ(Done, holder.SetVal(zkStr("s"), zkStr("k"), zkStr("2")));
     ASSERT_TRUE(zkWithFileSizeLimit(1, [&] { EXPECT_EQ(FileError, holder.Save()); }));
     EXPECT_EQ(Done, holder.Save());
