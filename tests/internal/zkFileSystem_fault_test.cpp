@@ -24,7 +24,7 @@ const Step kRenameRefused = {ZK_FAULTY(rename), {0, -1, EACCES}};  // the direct
 
 struct Row {
     const char* name;
-    Step steps[3];
+    Step steps[4];
     int errorSeen;  // 0: the replace succeeds
 };
 
@@ -57,6 +57,9 @@ const Row kRows[] = {
     {"in place: short reads and writes", {{armShortTransfers, {}}, kRenameRefused}, 0},
     // 12 short writes beside, then 3 bytes in place before the failure
     {"in place: short restore", {{armShortTransfers, {}}, kRenameRefused, {ZK_FAULTY(write), {14, -1, EIO}}}, EIO},
+    {"in place: restore interrupted after 12 bytes",
+     {{armShortTransfers, {}}, kRenameRefused, {ZK_FAULTY(write), {17, -1, EIO}}, {ZK_FAULTY(pwrite), {2, -1, EINTR}}},
+     EIO},
     {"in place: restore interrupted",
      {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}, {ZK_FAULTY(pwrite), {1, -1, EINTR}}},
      EIO},
@@ -83,7 +86,7 @@ zkSystemCalls recordingCreateModes() {
 
 // Replaces, through a link, a file of another group where we may, with
 // steps armed; errorSeen 0 when the replace must succeed.
-void expectReplace(const std::string& dir, const Step (&steps)[3], int errorSeen) {
+void expectReplace(const std::string& dir, const Step (&steps)[4], int errorSeen) {
     const std::string target = dir + "/" + kName, link = dir + "/link";
     ASSERT_TRUE(zkWriteFile(target, kOld));
     ASSERT_EQ(0, symlink(kName.c_str(), link.c_str()));
