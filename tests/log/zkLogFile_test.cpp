@@ -10,7 +10,7 @@
 
 // A line is the entry number and ") " when asked for, the local time
 // "HH:MM:SS MM/DD/YY" (on by default), two blanks and the message; the
-// constructor clears the file first. The zone is chosen so that the hour
+// constructor clears the file first, and nothing is echoed unless asked for. The zone is chosen so that the hour
 // reads 10, which has a tens digit to lose.
 TEST(LogFile, LineFormat) {
     zkTempDir dir;
@@ -22,10 +22,13 @@ TEST(LogFile, LineFormat) {
     std::strftime(stamp, sizeof stamp, "%H:%M:%S %m/%d/%y", std::localtime(&now));
     zkLogFile log(zkStringBase(dir.file("app.log").c_str()), 1);
     log.SetOption(zkLogFile::OptionEntryNumber, 1);
+    testing::internal::CaptureStdout();
     log.Log("Disk full", zkLogFile::LevelNormal);
+    log.Log("Again", zkLogFile::LevelNormal);
+    EXPECT_EQ("", testing::internal::GetCapturedStdout());  // no echo unless asked for
     unsetenv("TZ");
     if (std::time(nullptr) != now) GTEST_SKIP() << "the clock moved on to the next second meanwhile";
-    EXPECT_EQ("1) " + std::string(stamp) + "  Disk full\n", zkReadFile(dir.file("app.log")));
+    EXPECT_EQ("1) " + std::string(stamp) + "  Disk full\n2) " + stamp + "  Again\n", zkReadFile(dir.file("app.log")));
 }
 
 // The option words start as 0, 1 and 0. Only entries at or below the log's
@@ -71,6 +74,7 @@ TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
     EXPECT_EQ("kept\n1) 50% %s %n\n2) name x\n3) count -42\n4)  v\n5) t \n6) \n", zkReadFile(dir.file("m.log")));
     EXPECT_EQ("7) third\n", zkReadFile(dir.file("n.log")));
     EXPECT_EQ((std::set<std::string>{"folder", "m.log", "n.log"}), zkDirEntries(dir.path()));
+    EXPECT_TRUE(std::filesystem::is_directory(dir.file("folder")));
 }
 
 // Zeros lead n to two digits, or three, by signed comparisons: a negative n
