@@ -10,8 +10,9 @@
 
 // A line is the entry number and ") " when asked for, the local time
 // "HH:MM:SS MM/DD/YY" (on by default), two blanks and the message; the
-// constructor clears the file first, and nothing is echoed unless asked for. The zone is chosen so that the hour
-// reads 10, which has a tens digit to lose.
+// constructor clears the file first, and nothing is echoed unless asked
+// for. The zone is chosen so that the hour reads 10, which has a tens digit
+// to lose.
 TEST(LogFile, LineFormat) {
     zkTempDir dir;
     ASSERT_TRUE(zkWriteFile(dir.file("app.log"), "old\n"));
