@@ -134,7 +134,7 @@ TEST(StringEditing, EditsStayWithinTheirBounds) {
         {"abc", [](C& s) { s.insert("xy", 1).insert("xy", 0, 0).insert("<>", 99, 1); }, "xyaxybc<"},
         {"abc", [](C& s) { s.insert(S("1\0", 2), 2).insert(S("0"), 0).insert(S("-"), 1); }, {"0-ab1\0c", 7}},
         {"abcdef", [](C& s) { s.del(1, 2).del(4, 2).del(4, 12).del(3, 3).del(2, 3).erase(1, Bad); }, "a"},
-        {"abc", [](C& s) { s.cut(2).cut(0); }, "a"},
+        {"abc", [](C& s) { s.cut(2).cut(0); }, "a"}, {"a", [](C& s) { s.del(0, 0); }, ""},
         {"abcb", [](C& s) { s.replace("b", "XY", 0, true).replace("b", nullptr, 3, true); }, "aXYc"},
         {"abxbc", [](C& s) { s.replace("bc", "-", 0, true); }, "abx-"},
         {"aXYcb", [](C& s) { s.replace("xy", "-", 0, true).replace("xy", "-", 0, false); }, "a-cb"},
