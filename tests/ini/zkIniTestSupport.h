@@ -4,13 +4,8 @@
 #define ZK_TESTS_INI_TEST_SUPPORT_H
 
 #include <sys/stat.h>
-#include <unistd.h>
 
-#include <cerrno>
-#include <iomanip>
-#include <sstream>
 #include <string>
-#include <vector>
 
 #include "support/zkStringText.h"
 #include "support/zkTableFile.h"
