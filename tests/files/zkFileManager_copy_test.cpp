@@ -29,10 +29,6 @@ TEST(FileManagerCopy, SymbolicLinkInsteadOfACopy) {
     zkRunSteps("files_copy_links.txt");
 }
 
-TEST(FileManagerCopy, NewCopyTakesTheSourcesPermissionsAtMost) {
-    zkRunSteps("files_copy_modes.txt");
-}
-
 // The kernel will not copy from a memory file to another file system, so
 // this source goes through the block loop.
 TEST(FileManagerCopy, BlockLoopCopiesWhatTheKernelWillNot) {
@@ -47,58 +43,6 @@ TEST(FileManagerCopy, BlockLoopCopiesWhatTheKernelWillNot) {
     EXPECT_EQ(0, copyFile("/proc/self/fd/" + std::to_string(memory), dir.file("m"), 0, 1));
     EXPECT_EQ(big, zkReadFile(dir.file("m")));
     close(memory);
-}
-
-// A copy or a move that fails at any offset leaves no partial file and
-// keeps the source; an overwriting copy, beside the target or in place,
-// keeps the target's old bytes.
-TEST(FileManagerCopy, FileSizeLimitAtEveryOffsetLeavesNoPartialFile) {
-    zkTempDir dir;
-    const std::string source = dir.file("a.bin"), old = dir.file("old.bin");
-    const std::string bytes = std::string(1000, 'b') + std::string(2000, 'm');
-    ASSERT_TRUE(zkWriteFile(source, bytes));
-    ASSERT_TRUE(zkWriteFile(old, "old"));
-    const std::set<std::string> before = zkDirEntries(dir.path());
-    const auto limited = [&](size_t limit, const std::string& to, unsigned overwrite, unsigned move, bool inPlace) {
-        int result = -1;
-        EXPECT_TRUE(zkSave(dir, inPlace, limit, [&] { result = copyFile(source, to, 0, overwrite, move); }));
-        return result;
-    };
-    // Every offset near the ends and the block boundaries, a stride between.
-    for (size_t limit = 0; limit < bytes.size(); limit += limit < 16 || limit + 16 > bytes.size() ? 1 : 61) {
-        SCOPED_TRACE(limit);
-        ASSERT_NE(0, limited(limit, dir.file("b.bin"), 0, 0, false));
-        ASSERT_NE(0, limited(limit, dir.file("b.bin"), 0, 1, false));
-        ASSERT_NE(0, limited(limit, old, 1, 0, false));
-        ASSERT_EQ(bytes, zkReadFile(source));
-        ASSERT_EQ("old", zkReadFile(old));
-        ASSERT_EQ(before, zkDirEntries(dir.path()));
-    }
-    EXPECT_NE(0, limited(bytes.size() / 2, old, 1, 0, true));
-    EXPECT_EQ("old", zkReadFile(old));
-    EXPECT_EQ(0, limited(bytes.size(), dir.file("b.bin"), 0, 0, false));
-    EXPECT_EQ(bytes, zkReadFile(dir.file("b.bin")));
-}
-
-// In place, where the size the source claims is reserved first: a copy of
-// an empty source leaves an empty file, and a source that holds less than
-// its size says fails the copy after some bytes are written, and the old
-// bytes and length come back.
-TEST(FileManagerCopy, InPlaceCopyOfAnEmptyOrShortSource) {
-    zkTempDir dir;
-    const std::string target = dir.file("t"), shortFile = "/sys/devices/system/cpu/online";
-    int result = -1;
-    ASSERT_TRUE(zkWriteFile(dir.file("empty"), ""));
-    ASSERT_TRUE(zkWriteFile(target, "x"));
-    ASSERT_TRUE(zkSave(dir, true, RLIM_INFINITY, [&] { result = copyFile(dir.file("empty"), target, 0, 1); }));
-    EXPECT_EQ(0, result);
-    EXPECT_EQ("", zkReadFile(target));
-    if (!std::filesystem::exists(shortFile) || zkReadFile(shortFile).size() >= std::filesystem::file_size(shortFile))
-        GTEST_SKIP() << "no file here holds less than its size";
-    ASSERT_TRUE(zkWriteFile(target, "x"));
-    ASSERT_TRUE(zkSave(dir, true, RLIM_INFINITY, [&] { result = copyFile(shortFile, target, 0, 1); }));
-    EXPECT_EQ(1, result);
-    EXPECT_EQ("x", zkReadFile(target));
 }
 
 // A move whose source cannot be removed fails, and the copy stays.

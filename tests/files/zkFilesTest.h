@@ -19,12 +19,12 @@
 // Makes the entries of layout below dir, in order, written as zkTree writes
 // them: "name/" a folder, "name->target" a symbolic link, "name=text" a file;
 // also "name=>other" a hard link to the entry other, "name|" a FIFO and
-// "name%" a device that takes no writes, as /dev/full.
+// "name%N" the memory device of minor N (3 as /dev/null, 7 as /dev/full).
 inline void zkPlant(const std::string& dir, const std::string& layout) {
     std::istringstream entries(layout);
     for (std::string entry; entries >> entry;) {
-        const size_t link = entry.find("->"), hard = entry.find("=>"), text = entry.find('=');
-        const std::string path = dir + "/" + entry.substr(0, std::min(link, text));
+        const size_t link = entry.find("->"), hard = entry.find("=>"), text = entry.find('='), device = entry.find('%');
+        const std::string path = dir + "/" + entry.substr(0, std::min({link, text, device}));
         if (link != std::string::npos)
             ASSERT_EQ(0, symlink(entry.substr(link + 2).c_str(), path.c_str())) << entry;
         else if (hard != std::string::npos)
@@ -33,8 +33,8 @@ inline void zkPlant(const std::string& dir, const std::string& layout) {
             ASSERT_TRUE(zkWriteFile(path, entry.substr(text + 1))) << entry;
         else if (entry.back() == '|')
             ASSERT_EQ(0, mkfifo(path.substr(0, path.size() - 1).c_str(), 0666)) << entry;
-        else if (entry.back() == '%')
-            ASSERT_EQ(0, mknod(path.substr(0, path.size() - 1).c_str(), S_IFCHR | 0666, makedev(1, 7))) << entry;
+        else if (device != std::string::npos)
+            ASSERT_EQ(0, mknod(path.c_str(), S_IFCHR | 0666, makedev(1, std::stoi(entry.substr(device + 1))))) << entry;
         else
             ASSERT_EQ(0, mkdir(path.c_str(), 0777)) << entry;
     }

@@ -156,24 +156,6 @@ TEST(IniSave, WrittenForms) {
     });
 }
 
-// A document made in memory saves to a new file of mode 0666 less the umask.
-// The firewall section's name is matched by the compare type of the stored
-// name: one set through a case-insensitive string matches in any case.
-TEST(IniSave, MadeDocumentSavesToANewFile) {
-    zkTempDir dir;
-    const std::string path = dir.file("new.ini");
-    zkMappedINIFile ini(path.c_str());
-    ini.SetVal(zkStr("s"), zkStr("k"), zkStr(""));
-    ini.SetVal(zkStr("IPSBEHINDFIREWALL", zkStringBase::CaseInsensitive), zkStr("10.0.0.9"), zkStr(""));
-    const mode_t mask = umask(022);
-    EXPECT_EQ(0, ini.CloseFW(1));
-    umask(mask);
-    EXPECT_EQ("[s]\nk=\n\n[IPSBEHINDFIREWALL]\n10.0.0.9\n\n", zkReadFile(path));
-    struct stat st = {};
-    ASSERT_EQ(0, stat(path.c_str(), &st));
-    EXPECT_EQ(0644u, st.st_mode & 07777u);
-}
-
 // The rows of ini_failed_saves.txt close a document after setting a key.
 TEST(IniSave, OnlyASuccessfulSaveChangesTheFile) {
     zkTempDir dir;

@@ -151,21 +151,6 @@ TEST_F(FileSystemFault, SetIdBitsStayForAnOwnerWithoutPrivilege) {
     EXPECT_TRUE(zkSetEffectiveCapabilities(true));
 }
 
-TEST_F(FileSystemFault, FailedNewFileIsRemoved) {
-    const struct {
-        const char* name;
-        Arm arm;
-    } rows[] = {{"flush fails", ZK_FAULTY(fsync)}, {"close fails", ZK_FAULTY(close)}};
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.name);
-        zkArm({{row.arm, {1, -1, EIO}}});
-        errno = 0;
-        EXPECT_EQ(1, zkCreateNewFile(m_dir.file("new").c_str(), 0644, true, writeNew));
-        EXPECT_EQ(EIO, errno);
-        EXPECT_TRUE(zkDirEntries(m_dir.path()).empty());
-    }
-}
-
 TEST_F(FileSystemFault, DeviceFailuresAreReportedButAnUnsupportedFlushIsNot) {
     const struct {
         const char* name;

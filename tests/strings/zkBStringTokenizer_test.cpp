@@ -1,7 +1,6 @@
 // Splitting a string with zkBStringTokenizer.
 #include <gtest/gtest.h>
 
-#include <functional>
 #include <string>
 #include <vector>
 
@@ -21,25 +20,6 @@ TEST(Tokenizer, OneMoreTokenThanSeparators) {
         while (out.size() < 64 && tok.GetNext(token)) out.push_back(zkText(token));
         EXPECT_EQ(std::vector<std::string>(row.begin() + 3, row.end()), out);
     });
-}
-
-// The source and the separators are read at each call; false leaves the
-// token alone. A source cut below the position gives one empty token more.
-TEST(Tokenizer, InputsAreReadAtEachCall) {
-    zkStringBase source("a,b;c;d"), seps(","), token;
-    zkBStringTokenizer tok(source, seps, false);
-    // clang-format off
-    const struct { std::function<void()> change; bool more; const char* token; } steps[] = {
-        {[] {}, true, "a"}, {[&] { seps = ";"; }, true, "b"}, {[&] { source.cut(3); }, true, ""},
-        {[&] { token = "kept"; }, false, "kept"}, {[] {}, false, "kept"},
-    };
-    // clang-format on
-    for (const auto& step : steps) {
-        SCOPED_TRACE(&step - steps);
-        step.change();
-        EXPECT_EQ(step.more, tok.GetNext(token));
-        EXPECT_EQ(step.token, zkText(token));
-    }
 }
 
 // A token that is the source empties it first, which ends the walk; a token
