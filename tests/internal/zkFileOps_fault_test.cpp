@@ -7,49 +7,31 @@
 
 namespace {
 
-// calls: how many reads (reads) or writes were made.
-struct Row {
-    const char* name;
-    bool reads;
-    Step steps[2];
-    int result;
-    unsigned done;
-    long calls;
-};
-
 const Fault kCounted = {-1, 0, 0};  // never answers for the call, only counts it
-
-const Row kRows[] = {
-    {"read interrupted", true, {{ZK_FAULTY(read), {1, -1, EINTR}}}, 1, 10, 2},
-    {"read fails", true, {{ZK_FAULTY(read), {1, -1, EIO}}}, 0, 0, 1},
-    {"write interrupted", false, {{ZK_FAULTY(write), {1, -1, EINTR}}}, 1, 10, 2},
-    {"short writes", false, {{armShortTransfers, {}}, {ZK_FAULTY(write), kCounted}}, 1, 10, 4},
-    {"write takes nothing", false, {{armShortTransfers, {}}, {ZK_FAULTY(write), {2, 0, 0}}}, 0, 3, 2},
-    {"write fails", false, {{armShortTransfers, {}}, {ZK_FAULTY(write), {2, -1, EIO}}}, 0, 3, 2},
-};
 
 using HandleFiles = zkFaultTest;
 
+// The rows of transfer_faults.txt.
 TEST_F(HandleFiles, TransfersGoOnUntilDoneOrFailed) {
-    const std::string data = "0123456789";  // not a whole number of short writes
-    for (const Row& row : kRows) {
-        SCOPED_TRACE(row.name);
-        const std::string path = m_dir.file(row.name);
-        ASSERT_TRUE(zkWriteFile(path, row.reads ? data : ""));
+    const std::string data = "0123456789";
+    zkForEachRow("transfer_faults.txt", [&](const auto& row) {
+        const bool reads = row[1] == "read";
+        const unsigned moved = static_cast<unsigned>(std::stoul(row[3]));
+        const std::string path = m_dir.file(row[0]);
+        ASSERT_TRUE(zkWriteFile(path, reads ? data : ""));
         const int fd = open(path.c_str(), O_RDWR | O_CLOEXEC);
         ASSERT_NE(-1, fd);
         char got[16] = {};
         unsigned done = 99;
-        zkArm(row.steps);
-        const int result =
-            row.reads ? ReadFile(fd, got, 10, &done, nullptr) : WriteFile(fd, data.data(), 10, &done, nullptr);
+        zkArm(zkSteps(row, 5));
+        const int result = reads ? ReadFile(fd, got, 10, &done, nullptr) : WriteFile(fd, data.data(), 10, &done, nullptr);
         zkSystem = kRealCalls;
         close(fd);
-        EXPECT_EQ(row.result, result);
-        EXPECT_EQ(row.done, done);
-        EXPECT_EQ(data.substr(0, row.done), row.reads ? std::string(got) : zkReadFile(path));
-        EXPECT_EQ(row.calls, row.reads ? Faulty<&zkSystemCalls::read>::calls : Faulty<&zkSystemCalls::write>::calls);
-    }
+        EXPECT_EQ(std::stoi(row[2]), result);
+        EXPECT_EQ(moved, done);
+        EXPECT_EQ(data.substr(0, moved), reads ? std::string(got) : zkReadFile(path));
+        EXPECT_EQ(std::stol(row[4]), reads ? Faulty<&zkSystemCalls::read>::calls : Faulty<&zkSystemCalls::write>::calls);
+    });
 }
 
 // A path whose parent exists costs one mkdir however deep it lies; each

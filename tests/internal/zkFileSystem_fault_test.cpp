@@ -22,49 +22,6 @@ constexpr mode_t kMode = 06750;
 
 const Step kRenameRefused = {ZK_FAULTY(rename), {0, -1, EACCES}};  // the directory admits no new file
 
-struct Row {
-    const char* name;
-    Step steps[4];
-    int errorSeen;  // 0: the replace succeeds
-};
-
-const Row kRows[] = {
-    {"open interrupted", {{ZK_FAULTY(open), {1, -1, EINTR}}}, 0},
-    {"temporary name taken", {{ZK_FAULTY(open), {1, -1, EEXIST}}}, 0},
-    {"every temporary name taken", {{ZK_FAULTY(open), {0, -1, EEXIST}}}, EEXIST},
-    {"write interrupted", {{ZK_FAULTY(write), {1, -1, EINTR}}}, 0},
-    {"write fails", {{ZK_FAULTY(write), {1, -1, EIO}}}, EIO},
-    {"write takes nothing", {{ZK_FAULTY(write), {1, 0, 0}}}, EIO},
-    {"owner refused", {{ZK_FAULTY(fchown), {1, -1, EPERM}}}, 0},
-    {"mode refused", {{ZK_FAULTY(fchmod), {1, -1, EIO}}}, EIO},
-    {"flush fails", {{ZK_FAULTY(fsync), {1, -1, EIO}}}, EIO},
-    {"close fails", {{ZK_FAULTY(close), {1, -1, EIO}}}, EIO},
-    {"close interrupted", {{ZK_FAULTY(close), {1, -1, EINTR}}}, 0},
-    {"rename fails", {{ZK_FAULTY(rename), {1, -1, EIO}}}, EIO},
-    {"link unreadable", {{ZK_FAULTY(readlink), {1, -1, EIO}}}, EIO},
-    {"link target too long", {{ZK_FAULTY(readlink), {1, 4096, 0}}}, ENAMETOOLONG},
-    {"in place", {kRenameRefused}, 0},
-    {"in place: new file refused", {{ZK_FAULTY(open), {1, -1, EACCES}}}, 0},
-    {"in place: rename not permitted", {{ZK_FAULTY(rename), {0, -1, EPERM}}}, 0},
-    {"in place: open fails", {kRenameRefused, {ZK_FAULTY(open), {2, -1, EIO}}}, EIO},
-    {"in place: read interrupted", {kRenameRefused, {ZK_FAULTY(pread), {1, -1, EINTR}}}, 0},
-    {"in place: read fails", {kRenameRefused, {ZK_FAULTY(pread), {1, -1, EIO}}}, EIO},
-    {"in place: no space to reserve", {kRenameRefused, {ZK_FAULTY(allocate), {1, ENOSPC, 0}}}, ENOSPC},
-    {"in place: reserving unsupported", {kRenameRefused, {ZK_FAULTY(allocate), {1, EOPNOTSUPP, 0}}}, 0},
-    {"in place: write fails", {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}}, EIO},
-    {"in place: cut fails", {kRenameRefused, {ZK_FAULTY(ftruncate), {1, -1, EIO}}}, EIO},
-    {"in place: flush fails", {kRenameRefused, {ZK_FAULTY(fsync), {2, -1, EIO}}}, EIO},
-    {"in place: short reads and writes", {{armShortTransfers, {}}, kRenameRefused}, 0},
-    // 12 short writes beside, then 3 bytes in place before the failure
-    {"in place: short restore", {{armShortTransfers, {}}, kRenameRefused, {ZK_FAULTY(write), {14, -1, EIO}}}, EIO},
-    {"in place: restore interrupted after 12 bytes",
-     {{armShortTransfers, {}}, kRenameRefused, {ZK_FAULTY(write), {17, -1, EIO}}, {ZK_FAULTY(pwrite), {2, -1, EINTR}}},
-     EIO},
-    {"in place: restore interrupted",
-     {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}, {ZK_FAULTY(pwrite), {1, -1, EINTR}}},
-     EIO},
-};
-
 size_t openDescriptors() {
     return zkDirEntries("/proc/self/fd").size();
 }
@@ -86,7 +43,7 @@ zkSystemCalls recordingCreateModes() {
 
 // Replaces, through a link, a file of another group where we may, with
 // steps armed; errorSeen 0 when the replace must succeed.
-void expectReplace(const std::string& dir, const Step (&steps)[4], int errorSeen) {
+void expectReplace(const std::string& dir, const std::vector<Step>& steps, int errorSeen) {
     const std::string target = dir + "/" + kName, link = dir + "/link";
     ASSERT_TRUE(zkWriteFile(target, kOld));
     ASSERT_EQ(0, symlink(kName.c_str(), link.c_str()));
@@ -117,11 +74,13 @@ void expectReplace(const std::string& dir, const Step (&steps)[4], int errorSeen
 
 using FileSystemFault = zkFaultTest;
 
+// The rows of replace_faults.txt, each run as the user it names.
 TEST_F(FileSystemFault, OneFailingCallLeavesTheOldFileWhole) {
-    for (const Row& row : kRows) {
-        SCOPED_TRACE(row.name);
-        expectReplace(m_dir.path(), row.steps, row.errorSeen);
-    }
+    zkForEachRow("replace_faults.txt", [&](const auto& row) {
+        ASSERT_TRUE(zkSetEffectiveCapabilities(row[1] == "root"));
+        expectReplace(m_dir.path(), zkSteps(row, 3), static_cast<int>(zkNumber(row[2])));
+    });
+    EXPECT_TRUE(zkSetEffectiveCapabilities(true));
 }
 
 // Writes of three bytes a call, the nth failing: beside the file and in
@@ -137,40 +96,17 @@ TEST_F(FileSystemFault, AFailedWriteAtAnyOffsetLeavesTheOldFile) {
     }
 }
 
-// As an owner without privilege, whose writes and cuts clear the set-id
-// bits, which the replace gives back, also to an old file it restores.
-TEST_F(FileSystemFault, SetIdBitsStayForAnOwnerWithoutPrivilege) {
-    const Row rows[] = {{"beside", {}, 0},
-                        {"in place", {kRenameRefused}, 0},
-                        {"in place: write fails", {kRenameRefused, {ZK_FAULTY(write), {2, -1, EIO}}}, EIO}};
-    ASSERT_TRUE(zkSetEffectiveCapabilities(false));
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.name);
-        expectReplace(m_dir.path(), row.steps, row.errorSeen);
-    }
-    EXPECT_TRUE(zkSetEffectiveCapabilities(true));
-}
-
+// The rows of device_faults.txt.
 TEST_F(FileSystemFault, DeviceFailuresAreReportedButAnUnsupportedFlushIsNot) {
-    const struct {
-        const char* name;
-        Arm arm;
-        Fault fault;
-        int result;
-    } rows[] = {{"open fails", ZK_FAULTY(open), {1, -1, EIO}, 1},
-                {"flush fails", ZK_FAULTY(fsync), {1, -1, EIO}, 1},
-                {"flush unsupported", ZK_FAULTY(fsync), {1, -1, EINVAL}, 0},
-                {"flush succeeds, errno stale", ZK_FAULTY(fsync), {1, 0, EIO}, 0}};
     // A node of its own, so that a faulty replace could never take /dev/null.
     const std::string null = m_dir.file("null");
     if (mknod(null.c_str(), S_IFCHR | 0666, makedev(1, 3)) != 0) GTEST_SKIP() << "no device node can be made here";
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.name);
-        zkArm({{row.arm, row.fault}});
+    zkForEachRow("device_faults.txt", [&](const auto& row) {
+        zkArm(zkSteps(row, 3));
         errno = 0;
-        EXPECT_EQ(row.result, zkReplaceFile(null.c_str(), 0644, 0, writeNew));
-        EXPECT_EQ(row.fault.error, errno);
-    }
+        EXPECT_EQ(std::stoi(row[1]), zkReplaceFile(null.c_str(), 0644, 0, writeNew));
+        EXPECT_EQ(zkNumber(row[2]), errno);
+    });
 }
 
 }  // namespace

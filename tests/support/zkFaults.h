@@ -6,9 +6,14 @@
 #include <errno.h>
 #include <gtest/gtest.h>
 
+#include <map>
+#include <sstream>
+#include <string>
 #include <type_traits>
+#include <vector>
 
 #include "internal/zkFileSystem.h"
+#include "support/zkTableFile.h"
 #include "support/zkTempDir.h"
 
 inline const zkSystemCalls kRealCalls = zkSystem;
@@ -78,9 +83,41 @@ struct Step {
     Fault fault;
 };
 
+// An errno name of the fault tables, or a number.
+inline long zkNumber(const std::string& field) {
+    // clang-format off
+    static const std::map<std::string, long> names = {{"EINTR", EINTR}, {"EEXIST", EEXIST}, {"EIO", EIO},
+        {"EPERM", EPERM}, {"EACCES", EACCES}, {"ENOSPC", ENOSPC}, {"EOPNOTSUPP", EOPNOTSUPP},
+        {"ENAMETOOLONG", ENAMETOOLONG}, {"EINVAL", EINVAL}};
+    // clang-format on
+    const auto name = names.find(field);
+    return name != names.end() ? name->second : std::stol(field);
+}
+
+// The steps written in the fields of a fault table from index `from` on:
+// "CALL:NTH:RESULT:ERRNO" arms the entry CALL with that Fault, "short" arms
+// armShortTransfers.
+inline std::vector<Step> zkSteps(const std::vector<std::string>& fields, size_t from) {
+    // clang-format off
+    static const std::map<std::string, Arm> entries = {{"open", ZK_FAULTY(open)}, {"close", ZK_FAULTY(close)},
+        {"read", ZK_FAULTY(read)}, {"write", ZK_FAULTY(write)}, {"pread", ZK_FAULTY(pread)},
+        {"pwrite", ZK_FAULTY(pwrite)}, {"fsync", ZK_FAULTY(fsync)}, {"ftruncate", ZK_FAULTY(ftruncate)},
+        {"allocate", ZK_FAULTY(allocate)}, {"rename", ZK_FAULTY(rename)}, {"mkdir", ZK_FAULTY(mkdir)},
+        {"readlink", ZK_FAULTY(readlink)}, {"fchown", ZK_FAULTY(fchown)}, {"fchmod", ZK_FAULTY(fchmod)},
+        {"short", armShortTransfers}};
+    // clang-format on
+    std::vector<Step> steps;
+    for (size_t i = from; i < fields.size(); ++i) {
+        std::istringstream in(fields[i] + ":0:0:0");
+        std::string call, nth, result, error;
+        std::getline(std::getline(std::getline(std::getline(in, call, ':'), nth, ':'), result, ':'), error, ':');
+        steps.push_back({entries.at(call), {std::stol(nth), zkNumber(result), static_cast<int>(zkNumber(error))}});
+    }
+    return steps;
+}
+
 // Puts the calls of base in place and arms steps (empty ones skipped).
-template <size_t N>
-void zkArm(const Step (&steps)[N], const zkSystemCalls& base = kRealCalls) {
+inline void zkArm(const std::vector<Step>& steps, const zkSystemCalls& base = kRealCalls) {
     zkSystem = base;
     for (const Step& step : steps)
         if (step.arm != nullptr) step.arm(step.fault);
