@@ -8,7 +8,7 @@
 // same string as any argument. Backslashes become the chosen separator,
 // or '/' when asked.
 TEST(MakePath, JoinsDirectoryAndName) {
-    zkForEachCase("files_makepath.txt", [&](const zkRow& row) {
+    zkForEachRow("files_makepath.txt", [&](const zkRow& row) {
         zkStringBase path("stale");
         zkFileManager::m_slash = row.size() > 4 ? row[4][0] : '/';
         zkFileManager::MakePath(path, zkStr(row[0]), zkStr(row[1]), std::stoul(row[2]));

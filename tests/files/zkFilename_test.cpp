@@ -14,7 +14,7 @@ TEST(Filename, PartsOfAPath) {
     using Setter = void (zkFilename::*)(const char*);
     const std::map<std::string, Setter> setters = {
         {"name", &zkFilename::SetName}, {"ext", &zkFilename::SetExtension}, {"dir", &zkFilename::SetDirectory}};
-    zkForEachCase("files_names.txt", [&](const zkRow& row) {
+    zkForEachRow("files_names.txt", [&](const zkRow& row) {
         zkFilename f(row[0].c_str());
         if (!row[1].empty()) (f.*setters.at(row[1]))(row[2].c_str());
         EXPECT_EQ(row[3], parts(f));

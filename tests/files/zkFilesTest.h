@@ -58,17 +58,8 @@ inline std::string zkTree(const std::string& dir, const std::string& prefix = ""
     return out;
 }
 
-// Calls check(fields) for each row of tests/data/<name>, read as
-// zkForEachRow reads it, with "-" standing for an empty field.
+// The fields of a row of a table file.
 using zkRow = std::vector<std::string>;
-
-template <class Check>
-void zkForEachCase(const std::string& name, Check check) {
-    zkForEachRow(name, [&](zkRow row) {
-        for (std::string& field : row) field = field == "-" ? "" : field;
-        check(row);
-    });
-}
 
 // The fields of row from index `from` on, each followed by a space.
 inline std::string zkFields(const zkRow& row, size_t from) {
@@ -132,7 +123,7 @@ inline void zkStep(const zkRow& row) {
     }
 }
 
-// Runs the steps of tests/data/<name>, read as zkForEachCase reads it, in a new
+// Runs the steps of tests/data/<name>, read as zkForEachRow reads it, in a new
 // temporary directory that is the current directory meanwhile. A step is a
 // verb and its fields:
 //   plant ENTRIES...          makes the entries as zkPlant does
@@ -155,7 +146,7 @@ inline void zkRunSteps(const std::string& name) {
     const int home = open(".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     ASSERT_EQ(0, chdir(dir.path().c_str()));
     const mode_t mask = umask(0);
-    zkForEachCase(name, [](const zkRow& row) {
+    zkForEachRow(name, [](const zkRow& row) {
         const int next = dup(0);  // the lowest free descriptor, free again after each step
         close(next);
         zkStep(row);
