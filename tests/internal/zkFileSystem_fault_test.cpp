@@ -20,8 +20,6 @@ const std::string kNew = "the new bytes, longer than the old\n";
 constexpr gid_t kOtherGroup = 65534;
 constexpr mode_t kMode = 06750;
 
-const Step kRenameRefused = {ZK_FAULTY(rename), {0, -1, EACCES}};  // the directory admits no new file
-
 size_t openDescriptors() {
     return zkDirEntries("/proc/self/fd").size();
 }
@@ -81,19 +79,6 @@ TEST_F(FileSystemFault, OneFailingCallLeavesTheOldFileWhole) {
         expectReplace(m_dir.path(), zkSteps(row, 3), static_cast<int>(zkNumber(row[2])));
     });
     EXPECT_TRUE(zkSetEffectiveCapabilities(true));
-}
-
-// Writes of three bytes a call, the nth failing: beside the file and in
-// place, a failure at any offset of the new bytes leaves the old file.
-TEST_F(FileSystemFault, AFailedWriteAtAnyOffsetLeavesTheOldFile) {
-    const long calls = static_cast<long>(kNew.size() + 2) / 3;
-    for (const Step& where : {Step{}, kRenameRefused}) {
-        for (long nth = 1; nth <= calls; ++nth) {
-            SCOPED_TRACE(std::string(where.arm ? "in place, " : "beside, ") + std::to_string(nth));
-            const long failing = where.arm ? calls + nth : nth;  // in place comes after the writes beside
-            expectReplace(m_dir.path(), {{armShortTransfers, {}}, where, {ZK_FAULTY(write), {failing, -1, EIO}}}, EIO);
-        }
-    }
 }
 
 // The rows of device_faults.txt.

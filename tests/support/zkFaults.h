@@ -6,6 +6,7 @@
 #include <errno.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <map>
 #include <sstream>
 #include <string>
@@ -63,17 +64,19 @@ struct Faulty<Entry, R (*)(A...)> {
 using Arm = void (*)(Fault);
 #define ZK_FAULTY(entry) &Faulty<&zkSystemCalls::entry>::arm
 
-// Reads and writes that move at most three bytes a call; armed before the
-// faults that count those calls.
-inline void armShortTransfers(Fault) {
+// Reads and writes that move at most the Fault's result in bytes a call, or
+// three when it is 0; armed before the faults that count those calls.
+inline size_t gTransferCap = 3;
+inline void armShortTransfers(Fault f) {
+    gTransferCap = f.result > 0 ? static_cast<size_t>(f.result) : 3;
     zkSystem.write = [](int fd, const void* data, size_t size) {
-        return kRealCalls.write(fd, data, size < 3 ? size : 3);
+        return kRealCalls.write(fd, data, std::min(size, gTransferCap));
     };
     zkSystem.pread = [](int fd, void* data, size_t size, off_t at) {
-        return kRealCalls.pread(fd, data, size < 3 ? size : 3, at);
+        return kRealCalls.pread(fd, data, std::min(size, gTransferCap), at);
     };
     zkSystem.pwrite = [](int fd, const void* data, size_t size, off_t at) {
-        return kRealCalls.pwrite(fd, data, size < 3 ? size : 3, at);
+        return kRealCalls.pwrite(fd, data, std::min(size, gTransferCap), at);
     };
 }
 
@@ -95,8 +98,8 @@ inline long zkNumber(const std::string& field) {
 }
 
 // The steps written in the fields of a fault table from index `from` on:
-// "CALL:NTH:RESULT:ERRNO" arms the entry CALL with that Fault, "short" arms
-// armShortTransfers.
+// "CALL:NTH:RESULT:ERRNO" arms the entry CALL with that Fault, "short" (or
+// "short:0:N") arms armShortTransfers.
 inline std::vector<Step> zkSteps(const std::vector<std::string>& fields, size_t from) {
     // clang-format off
     static const std::map<std::string, Arm> entries = {{"open", ZK_FAULTY(open)}, {"close", ZK_FAULTY(close)},
