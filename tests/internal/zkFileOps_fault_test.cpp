@@ -24,13 +24,15 @@ TEST_F(HandleFiles, TransfersGoOnUntilDoneOrFailed) {
         char got[16] = {};
         unsigned done = 99;
         zkArm(zkSteps(row, 5));
-        const int result = reads ? ReadFile(fd, got, 10, &done, nullptr) : WriteFile(fd, data.data(), 10, &done, nullptr);
+        const int result =
+            reads ? ReadFile(fd, got, 10, &done, nullptr) : WriteFile(fd, data.data(), 10, &done, nullptr);
         zkSystem = kRealCalls;
         close(fd);
         EXPECT_EQ(std::stoi(row[2]), result);
         EXPECT_EQ(moved, done);
         EXPECT_EQ(data.substr(0, moved), reads ? std::string(got) : zkReadFile(path));
-        EXPECT_EQ(std::stol(row[4]), reads ? Faulty<&zkSystemCalls::read>::calls : Faulty<&zkSystemCalls::write>::calls);
+        EXPECT_EQ(std::stol(row[4]),
+                  reads ? Faulty<&zkSystemCalls::read>::calls : Faulty<&zkSystemCalls::write>::calls);
     });
 }
 
