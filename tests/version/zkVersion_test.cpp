@@ -14,13 +14,9 @@ static void expectFields(int major, int minor, char subMinor, const zkVersionDes
     EXPECT_EQ(subMinor, v.GetSubMinor());
 }
 
-TEST(VersionDescriptor, StartsAtZero) {
-    expectFields(0, 0, 0, zkVersionDescriptor());
-    expectFields(0, 0, 0, zkVersionDescriptor(".5"));
-}
-
 // Each text is read from a heap buffer of its exact size, so that a read past
-// the end is caught. A null text leaves the version alone too.
+// the end is caught. A null text leaves the version alone too, and a new
+// version starts at 0.0 with no sub-minor.
 TEST(VersionDescriptor, ParsesText) {
     zkForEachRow("str_versions.txt", [](const auto& row) {
         const std::vector<char> text(row[0].c_str(), row[0].c_str() + row[0].size() + 1);
@@ -33,6 +29,8 @@ TEST(VersionDescriptor, ParsesText) {
     expectFields(9, 9, 0, v);
     const char shifted[] = "95";  // the byte before the text is never read
     expectFields(5, 0, 0, zkVersionDescriptor(shifted + 1));
+    expectFields(0, 0, 0, zkVersionDescriptor());
+    expectFields(0, 0, 0, zkVersionDescriptor(".5"));
 }
 
 // Major, then minor, then the sub-minor as a signed byte: a byte of 0x80 or
