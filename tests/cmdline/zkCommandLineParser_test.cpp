@@ -75,7 +75,6 @@ TEST(CommandLineParser, ValidateGivesTheResult) {
     EXPECT_EQ(0, r.SetCommand(zkStringBase("-b:2")));
     EXPECT_EQ(0, r.IsValid());
     EXPECT_EQ(0, r.SetCommand(2, argv));
-    EXPECT_EQ((std::vector<int>{2, 1, 0}), r.vectorState());
     expectEntries(r, {"a", "1", "b", "2", "in", "data.ini"});
     r.SetValue("b", zkStringBase("set"));
     r.SetValue("in", zkStringBase("set"));
@@ -98,7 +97,6 @@ TEST(CommandLineParser, CaseInsensitiveLookupFindsCapitals) {
         SCOPED_TRACE(i);
         zkStringBase name(("name" + std::to_string(i) + "xyz").c_str()), out("kept");
         EXPECT_EQ(0, p.GetValue(name, out));
-        EXPECT_STREQ("kept", out.data());
         name.setCompareType(zkStringBase::CaseInsensitive);
         EXPECT_EQ(1, p.GetValue(name, out));
         EXPECT_EQ(std::to_string(i), out.data());

@@ -1,18 +1,16 @@
-// zkLogFile: the line format, levels, numbering, echo, clearing, failing
-// writes and concurrent writers.
+// zkLogFile: the line format, levels, numbering, echo, clearing and failing
+// writes.
 #include <gtest/gtest.h>
 
 #include <ctime>
-#include <thread>
 
 #include "support/zkTempDir.h"
 #include "zkLogFile.h"
 
 // A line is the entry number and ") " when asked for, the local time
 // "HH:MM:SS MM/DD/YY" (on by default), two blanks and the message; the
-// constructor clears the file first, and nothing is echoed unless asked
-// for. The zone is chosen so that the hour reads 10, which has a tens digit
-// to lose.
+// constructor clears the file first. The zone is chosen so that the hour
+// reads 10, which has a tens digit to lose.
 TEST(LogFile, LineFormat) {
     zkTempDir dir;
     ASSERT_TRUE(zkWriteFile(dir.file("app.log"), "old\n"));
@@ -23,10 +21,8 @@ TEST(LogFile, LineFormat) {
     std::strftime(stamp, sizeof stamp, "%H:%M:%S %m/%d/%y", std::localtime(&now));
     zkLogFile log(zkStringBase(dir.file("app.log").c_str()), 1);
     log.SetOption(zkLogFile::OptionEntryNumber, 1);
-    testing::internal::CaptureStdout();
     log.Log("Disk full", zkLogFile::LevelNormal);
     log.Log("Again", zkLogFile::LevelNormal);
-    EXPECT_EQ("", testing::internal::GetCapturedStdout());  // no echo unless asked for
     unsetenv("TZ");
     if (std::time(nullptr) != now) GTEST_SKIP() << "the clock moved on to the next second meanwhile";
     EXPECT_EQ("1) " + std::string(stamp) + "  Disk full\n2) " + stamp + "  Again\n", zkReadFile(dir.file("app.log")));
@@ -34,9 +30,9 @@ TEST(LogFile, LineFormat) {
 
 // The option words start as 0, 1 and 0. Only entries at or below the log's
 // level (1 at first) are written and numbered, their messages verbatim; a
-// two-part message starts afresh each time. A new file name turns the
-// reserved option word back to 0, and the counter goes on; a nonzero clear
-// deletes the file of that name, but never a folder. The echo goes to
+// two-part message starts afresh each time. With a new file name the
+// counter goes on; a nonzero clear deletes the file of that name, but never
+// a folder. The echo goes to
 // standard output at once, for the next written entry only, whether or not
 // the file can be written; a failed write leaves the file as it was.
 TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
@@ -61,9 +57,7 @@ TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
     log.Log(static_cast<const char*>(nullptr), zkLogFile::LevelNormal);
     log.SetLevel(zkLogFile::LogLevel(-1));
     log.Log("dropped", zkLogFile::LevelError);
-    log.SetOption(zkLogFile::OptionReserved, 7);
     log.SetFilename(dir.file("n.log").c_str(), 1);
-    EXPECT_EQ(0u, log.GetOption(zkLogFile::OptionReserved));
     log.Log("third", zkLogFile::LogLevel(-1));
     log.SetOption(zkLogFile::OptionEntryNumber, 0);
     ASSERT_TRUE(zkWithFileSizeLimit(9, [&] { log.Log("refused", zkLogFile::LogLevel(-1)); }));
@@ -91,23 +85,4 @@ TEST(LogFile, MakeTDNumPadsWithSignedComparisons) {
         log.MakeTDNum(out, n, three);
         EXPECT_STREQ(text, out.data());
     }
-}
-
-// Entries from four threads, one log object each, all arrive whole and once,
-// unnumbered by default.
-TEST(LogLoad, EveryConcurrentEntryArrivesWholeOnce) {
-    zkTempDir dir;
-    std::string pad(200, '.'), line;
-    std::multiset<std::string> expected, lines;
-    std::thread writers[4];
-    for (int w = 0; w < 4; ++w)
-        writers[w] = std::thread([&, w] {
-            zkLogFile log(zkStringBase(dir.file("load.log").c_str()), 0);
-            log.SetOption(zkLogFile::OptionTimeStamp, 0);
-            for (int n = w; n < 2000; n += 4) log.Log((std::to_string(n) + pad).c_str(), zkLogFile::LevelNormal);
-        });
-    for (int n = 0; n < 2000; ++n) expected.insert(std::to_string(n) + pad);
-    for (std::thread& writer : writers) writer.join();
-    for (std::ifstream in(dir.file("load.log")); std::getline(in, line);) lines.insert(line);
-    EXPECT_EQ(expected, lines);
 }

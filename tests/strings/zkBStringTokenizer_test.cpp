@@ -9,9 +9,6 @@
 #include "zkBStringTokenizer.h"
 
 TEST(Tokenizer, OneMoreTokenThanSeparators) {
-    EXPECT_EQ(" ", zkText(zkBStringTokenizer::m_spToken));
-    EXPECT_EQ("\r\n", zkText(zkBStringTokenizer::m_crlfToken));
-    EXPECT_EQ(",", zkText(zkBStringTokenizer::m_csvToken));
     zkForEachRow("str_tokens.txt", [](const auto& row) {
         const zkStringBase source = zkStr(row[0]), seps = zkStr(row[1]);
         zkBStringTokenizer tok(source, seps, row[2] == "strip");
