@@ -84,7 +84,7 @@ TEST(StringConstruction, CapacityIsTextPlusSlack) {
 // keeps the one it started with. Ranges are clamped to the text; a null or
 // empty source adds nothing; a length past 32 bits throws with the text
 // kept, also when the source lies in the string's own buffer.
-TEST(StringEditing, TextAndCapacityAfterEachEdit) {
+TEST(StringEditing, EditsFollowTheGrowthRule) {
     const unsigned big = static_cast<unsigned>(std::to_string(1e300).size());
     const unsigned longMin = static_cast<unsigned>(std::to_string(LONG_MIN).size());
     // clang-format off
