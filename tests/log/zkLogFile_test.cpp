@@ -30,9 +30,9 @@ TEST(LogFile, LineFormat) {
 
 // The option words start as 0, 1 and 0. Only entries at or below the log's
 // level (1 at first) are written and numbered, their messages verbatim; a
-// two-part message starts afresh each time. With a new file name the
-// counter goes on; a nonzero clear deletes the file of that name, but never
-// a folder. The echo goes to
+// two-part message starts afresh each time. A new file name turns the
+// reserved option word back to 0, and the counter goes on; a nonzero clear
+// deletes the file of that name, but never a folder. The echo goes to
 // standard output at once, for the next written entry only, whether or not
 // the file can be written; a failed write leaves the file as it was.
 TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
@@ -57,7 +57,9 @@ TEST(LogFile, EntriesAtOrBelowTheLevelAreWritten) {
     log.Log(static_cast<const char*>(nullptr), zkLogFile::LevelNormal);
     log.SetLevel(zkLogFile::LogLevel(-1));
     log.Log("dropped", zkLogFile::LevelError);
+    log.SetOption(zkLogFile::OptionReserved, 7);
     log.SetFilename(dir.file("n.log").c_str(), 1);
+    EXPECT_EQ(0u, log.GetOption(zkLogFile::OptionReserved));
     log.Log("third", zkLogFile::LogLevel(-1));
     log.SetOption(zkLogFile::OptionEntryNumber, 0);
     ASSERT_TRUE(zkWithFileSizeLimit(9, [&] { log.Log("refused", zkLogFile::LogLevel(-1)); }));
